@@ -1,0 +1,45 @@
+// The record I/O runtime under the numbered-unit file layer: files addressed
+// by small unit numbers, formatted (text records, one per line) or
+// unformatted (binary records framed by their byte count).
+//
+// Statuses: 0 success, -1 end of file, a positive value for an error.
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+
+namespace pc::fileio {
+
+inline constexpr int kIoOk = 0;
+inline constexpr int kIoEnd = -1;
+
+// Unit -1 in a text write means standard output.
+inline constexpr int kStandardOutputUnit = -1;
+
+enum class OpenDisposition { Old, New, Unknown };
+enum class FileForm { Formatted, Unformatted };
+
+// Opens `unit` on the named file for sequential access, positioned at its
+// start. Old: must exist. New: must not exist, created. Unknown: opened when
+// it exists, created otherwise. Status 0 when open; non-zero: nothing opened.
+int openUnit(int unit, const std::string& name, OpenDisposition disposition, FileForm form);
+// Closes the unit (and deletes its file when asked). A pending write error,
+// or a failure to flush, gives a positive status; the unit is free afterwards.
+int closeUnit(int unit, bool deleteFile = false);
+bool isUnitOpen(int unit);
+bool namedFileExists(const std::string& name);
+int rewindUnit(int unit);
+int backspaceUnit(int unit);
+
+// Unformatted records. readRecord transfers the first `size` bytes of the next
+// record and moves past the record; a record shorter than `size`, or damaged
+// framing, is an error (positive status).
+int readRecord(int unit, void* data, std::size_t size);
+int writeRecord(int unit, const void* data, std::size_t size);
+
+// Formatted records: one line each, without its line end.
+int readTextRecord(int unit, std::string& record);
+int writeTextRecord(int unit, std::string_view record);
+
+}  // namespace pc::fileio

@@ -1,0 +1,43 @@
+// The operating-system services the program needs, behind one small layer so
+// that a Windows build only has to supply another implementation of this file.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace pc::platform {
+
+// Native directory separator ('/' here, '\\' on Windows).
+char nativeSeparator();
+
+// Process environment. An unset variable gives nullopt (a set but empty one "").
+std::optional<std::string> getEnv(const std::string& name);
+bool setEnv(const std::string& name, const std::string& value);
+bool unsetEnv(const std::string& name);
+
+// Full path of the running executable, or nullopt when it cannot be had.
+std::optional<std::string> executablePath();
+
+std::uint32_t processId();
+void sleepMilliseconds(unsigned milliseconds);
+
+// File attributes. Each is false/nullopt when the name does not exist.
+bool pathExists(const std::string& name);
+bool isRegularFile(const std::string& name);
+bool isDirectory(const std::string& name);
+// Modification time in seconds since the epoch; nullopt when absent.
+std::optional<std::int64_t> modificationTime(const std::string& name);
+
+// Creates one directory level. 0 on success, 1 when it already exists or
+// access is denied (callers treat both as benign), -1 on any other failure.
+int makeDirectory(const std::string& name);
+// Removes one file; true on success.
+bool removeFile(const std::string& name);
+
+// Names (not paths) of the entries of a directory, in an unspecified order;
+// empty when the directory cannot be read.
+std::vector<std::string> listDirectory(const std::string& directory);
+
+}  // namespace pc::platform

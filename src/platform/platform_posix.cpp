@@ -1,0 +1,87 @@
+#include "platform/platform.h"
+
+#ifndef _WIN32
+
+#include <dirent.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <chrono>
+#include <cstdlib>
+#include <thread>
+
+namespace pc::platform {
+
+char nativeSeparator() { return '/'; }
+
+std::optional<std::string> getEnv(const std::string& name) {
+  const char* value = std::getenv(name.c_str());
+  if (value == nullptr) return std::nullopt;
+  return std::string(value);
+}
+
+bool setEnv(const std::string& name, const std::string& value) {
+  return ::setenv(name.c_str(), value.c_str(), 1) == 0;
+}
+
+bool unsetEnv(const std::string& name) { return ::unsetenv(name.c_str()) == 0; }
+
+std::optional<std::string> executablePath() {
+  std::string buffer(4096, '\0');
+  const ssize_t n = ::readlink("/proc/self/exe", buffer.data(), buffer.size() - 1);
+  if (n <= 0) return std::nullopt;
+  buffer.resize(static_cast<size_t>(n));
+  return buffer;
+}
+
+std::uint32_t processId() { return static_cast<std::uint32_t>(::getpid()); }
+
+void sleepMilliseconds(unsigned milliseconds) {
+  std::this_thread::sleep_for(std::chrono::milliseconds(milliseconds));
+}
+
+bool pathExists(const std::string& name) {
+  struct stat st {};
+  return !name.empty() && ::stat(name.c_str(), &st) == 0;
+}
+
+bool isRegularFile(const std::string& name) {
+  struct stat st {};
+  return !name.empty() && ::stat(name.c_str(), &st) == 0 && S_ISREG(st.st_mode);
+}
+
+bool isDirectory(const std::string& name) {
+  struct stat st {};
+  return !name.empty() && ::stat(name.c_str(), &st) == 0 && S_ISDIR(st.st_mode);
+}
+
+std::optional<std::int64_t> modificationTime(const std::string& name) {
+  struct stat st {};
+  if (name.empty() || ::stat(name.c_str(), &st) != 0) return std::nullopt;
+  return static_cast<std::int64_t>(st.st_mtime);
+}
+
+int makeDirectory(const std::string& name) {
+  if (::mkdir(name.c_str(), 0777) == 0) return 0;
+  if (errno == EEXIST || errno == EACCES) return 1;
+  return -1;
+}
+
+bool removeFile(const std::string& name) { return ::unlink(name.c_str()) == 0; }
+
+std::vector<std::string> listDirectory(const std::string& directory) {
+  std::vector<std::string> names;
+  DIR* dir = ::opendir(directory.empty() ? "." : directory.c_str());
+  if (dir == nullptr) return names;
+  while (const dirent* entry = ::readdir(dir)) {
+    const std::string name = entry->d_name;
+    if (name != "." && name != "..") names.push_back(name);
+  }
+  ::closedir(dir);
+  return names;
+}
+
+}  // namespace pc::platform
+
+#endif  // !_WIN32

@@ -1,0 +1,84 @@
+#include "support/test_support.h"
+
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <sstream>
+
+namespace pc::test {
+
+TempDir::TempDir() {
+  std::string pattern = (std::filesystem::temp_directory_path() / "pc-test-XXXXXX").string();
+  if (::mkdtemp(pattern.data()) == nullptr) std::abort();
+  path_ = pattern;
+}
+
+TempDir::~TempDir() {
+  std::error_code ec;
+  std::filesystem::remove_all(path_, ec);
+}
+
+ScopedEnv::ScopedEnv(std::string name, const std::optional<std::string>& value) : name_(std::move(name)) {
+  if (const char* old = std::getenv(name_.c_str())) old_ = old;
+  if (value) {
+    ::setenv(name_.c_str(), value->c_str(), 1);
+  } else {
+    ::unsetenv(name_.c_str());
+  }
+}
+
+ScopedEnv::~ScopedEnv() {
+  if (old_) {
+    ::setenv(name_.c_str(), old_->c_str(), 1);
+  } else {
+    ::unsetenv(name_.c_str());
+  }
+}
+
+void writeFile(const std::string& path, const std::string& bytes) {
+  std::ofstream out(path, std::ios::binary | std::ios::trunc);
+  out.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+}
+
+std::string readFile(const std::string& path) {
+  std::ifstream in(path, std::ios::binary);
+  return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+}
+
+bool fileExists(const std::string& path) { return std::filesystem::exists(path); }
+
+namespace {
+template <typename T>
+void putRaw(std::string& out, T v) {
+  char bytes[sizeof(T)];
+  std::memcpy(bytes, &v, sizeof(T));  // the test machines are little-endian
+  out.append(bytes, sizeof(T));
+}
+}  // namespace
+
+void putInt32(std::string& out, std::int32_t v) { putRaw(out, v); }
+void putInt16(std::string& out, std::int16_t v) { putRaw(out, v); }
+void putFloat(std::string& out, float v) { putRaw(out, v); }
+void putDouble(std::string& out, double v) { putRaw(out, v); }
+
+std::string framedRecord(const std::string& data) {
+  std::string out;
+  putInt32(out, static_cast<std::int32_t>(data.size()));
+  out += data;
+  putInt32(out, static_cast<std::int32_t>(data.size()));
+  return out;
+}
+
+std::string contourInfoBytes(const std::vector<std::vector<float>>& records) {
+  std::string out;
+  for (const auto& r : records) {
+    std::string data;
+    for (float v : r) putFloat(data, v);
+    out += framedRecord(data);
+  }
+  return out;
+}
+
+}  // namespace pc::test
