@@ -13,6 +13,11 @@ namespace pc::fileio {
 
 inline constexpr int kIoOk = 0;
 inline constexpr int kIoEnd = -1;
+// Positive statuses, one per kind of failure.
+inline constexpr int kIoErrorUnit = 1;    // unit not open, or not of the form/access the operation needs
+inline constexpr int kIoErrorOpen = 2;    // the file could not be opened (or created)
+inline constexpr int kIoErrorRecord = 3;  // damaged framing, a record shorter than asked, a line too long
+inline constexpr int kIoErrorSystem = 4;  // the system failed a read, write, seek, flush, close or delete
 
 // Unit -1 in a text write means standard output.
 inline constexpr int kStandardOutputUnit = -1;
@@ -39,7 +44,13 @@ int readRecord(int unit, void* data, std::size_t size);
 int writeRecord(int unit, const void* data, std::size_t size);
 
 // Formatted records: one line each, without its line end.
+// A line end is "\n" or "\r\n"; a last line without one is still a record.
+// Lines longer than kMaxTextRecord are a record error.
+inline constexpr std::size_t kMaxTextRecord = std::size_t{1} << 20;
 int readTextRecord(int unit, std::string& record);
 int writeTextRecord(int unit, std::string_view record);
+
+// Closes every open unit, flushing pending writes (also done at process exit).
+void closeAllUnits();
 
 }  // namespace pc::fileio

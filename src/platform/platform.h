@@ -40,4 +40,31 @@ bool removeFile(const std::string& name);
 // empty when the directory cannot be read.
 std::vector<std::string> listDirectory(const std::string& directory);
 
+// Creates one directory level and tells exactly what happened, for callers
+// that must tell an existing directory from a refused creation.
+enum class DirectoryCreation { created, alreadyExists, accessDenied, failed };
+DirectoryCreation createDirectory(const std::string& name);
+
+// Name of the directory that holds this platform's executables in the
+// suite's installation layout (<home>/exe/<this>/<program>).
+const char* platformDirectoryName();
+
+// Stops a process running under a debugger here. Without a debugger the
+// process ends abnormally (SIGTRAP on POSIX systems).
+void breakpointTrap();
+
+// Broken-down local time of the current second.
+struct LocalTime {
+  int year = 0;    // four digits
+  int month = 0;   // 1..12
+  int day = 0;     // 1..31
+  int hour = 0;    // 0..23
+  int minute = 0;  // 0..59
+  int second = 0;  // 0..60
+};
+// Seconds since the epoch, and their local time (nullopt when the time
+// cannot be converted).
+std::int64_t currentTime();
+std::optional<LocalTime> localTime(std::int64_t secondsSinceEpoch);
+
 }  // namespace pc::platform

@@ -8,7 +8,9 @@
 
 #include <cerrno>
 #include <chrono>
+#include <csignal>
 #include <cstdlib>
+#include <ctime>
 #include <thread>
 
 namespace pc::platform {
@@ -80,6 +82,34 @@ std::vector<std::string> listDirectory(const std::string& directory) {
   }
   ::closedir(dir);
   return names;
+}
+
+DirectoryCreation createDirectory(const std::string& name) {
+  if (name.empty()) return DirectoryCreation::failed;
+  if (::mkdir(name.c_str(), 0777) == 0) return DirectoryCreation::created;
+  switch (errno) {
+    case EEXIST:
+      return DirectoryCreation::alreadyExists;
+    case EACCES:
+    case EPERM:
+    case EROFS:
+      return DirectoryCreation::accessDenied;
+    default:
+      return DirectoryCreation::failed;
+  }
+}
+
+const char* platformDirectoryName() { return "linux"; }
+
+void breakpointTrap() { std::raise(SIGTRAP); }
+
+std::int64_t currentTime() { return static_cast<std::int64_t>(std::time(nullptr)); }
+
+std::optional<LocalTime> localTime(std::int64_t secondsSinceEpoch) {
+  const std::time_t t = static_cast<std::time_t>(secondsSinceEpoch);
+  std::tm tm {};
+  if (::localtime_r(&t, &tm) == nullptr) return std::nullopt;
+  return LocalTime{tm.tm_year + 1900, tm.tm_mon + 1, tm.tm_mday, tm.tm_hour, tm.tm_min, tm.tm_sec};
 }
 
 }  // namespace pc::platform

@@ -1,0 +1,83 @@
+#include "e2e/e2e_support.h"
+
+#include <fcntl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <map>
+
+extern char** environ;
+
+namespace pc::test {
+
+WorkZone::WorkZone() { std::filesystem::create_directories(tmp()); }
+
+void WorkZone::writeParameters(const std::vector<std::pair<int, std::string>>& lines) const {
+  std::map<int, std::string> bySlot(lines.begin(), lines.end());
+  std::string text;
+  for (int slot = 1; slot <= 580; ++slot) {
+    auto it = bySlot.find(slot);
+    text += (it != bySlot.end() ? it->second : std::string("0.00000   :  ")) + "\n";
+  }
+  writeFile(tmpFile("outil.par"), text);
+}
+
+void WorkZone::writeContours(const std::vector<std::vector<float>>& records) const {
+  writeFile(tmpFile("trxcon.inf"), contourInfoBytes(records));
+}
+
+RunResult WorkZone::run(const std::vector<std::string>& args, const std::vector<std::string>& extraEnv) const {
+  // The child starts from this process's environment minus the variables that
+  // would point it elsewhere.
+  std::vector<std::string> env;
+  for (char** e = environ; *e != nullptr; ++e) {
+    const std::string entry = *e;
+    if (entry.rfind("TRX", 0) == 0) continue;
+    env.push_back(entry);
+  }
+  env.push_back("TRXZONE=" + zone());
+  env.push_back("TRXTMPDIR=" + tmp());
+  for (const auto& e : extraEnv) env.push_back(e);
+
+  int pipeFds[2];
+  if (pipe(pipeFds) != 0) return {};
+  const pid_t pid = fork();
+  if (pid == 0) {
+    close(pipeFds[0]);
+    dup2(pipeFds[1], STDOUT_FILENO);
+    close(pipeFds[1]);
+    if (chdir(zone().c_str()) != 0) _exit(127);
+    std::vector<char*> argv{const_cast<char*>(PC_EXECUTABLE)};
+    for (const auto& a : args) argv.push_back(const_cast<char*>(a.c_str()));
+    argv.push_back(nullptr);
+    std::vector<char*> envp;
+    for (auto& e : env) envp.push_back(e.data());
+    envp.push_back(nullptr);
+    execve(PC_EXECUTABLE, argv.data(), envp.data());
+    _exit(127);
+  }
+  close(pipeFds[1]);
+  RunResult result;
+  char buffer[4096];
+  ssize_t n;
+  while ((n = read(pipeFds[0], buffer, sizeof buffer)) > 0) result.out.append(buffer, static_cast<size_t>(n));
+  close(pipeFds[0]);
+  int status = 0;
+  waitpid(pid, &status, 0);
+  if (WIFEXITED(status)) result.exitStatus = WEXITSTATUS(status);
+  return result;
+}
+
+void appendSquare(std::vector<std::vector<float>>& records, float x0, float y0, float size, float z) {
+  records.push_back({x0, y0, z});
+  records.push_back({x0 + size, y0, z});
+  records.push_back({x0 + size, y0 + size, z});
+  records.push_back({x0, y0 + size, z});
+  records.push_back({x0, y0, z});
+  records.push_back({99999.0f, 99999.0f, 99999.0f});
+}
+
+}  // namespace pc::test

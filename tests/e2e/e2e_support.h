@@ -1,0 +1,42 @@
+// Runs the built executable in a temporary work zone and captures what it
+// prints and how it ends.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "support/test_support.h"
+
+namespace pc::test {
+
+struct RunResult {
+  int exitStatus = -1000;  // 0..255, or -1000 when it did not exit normally
+  std::string out;
+};
+
+// A work zone whose temporary directory ($TMP, through TRXTMPDIR) is zone/tmp.
+class WorkZone {
+ public:
+  WorkZone();
+  std::string zone() const { return dir_.file("zone"); }
+  std::string tmp() const { return dir_.file("zone/tmp"); }
+  std::string tmpFile(const std::string& name) const { return tmp() + "/" + name; }
+  std::string zoneFile(const std::string& name) const { return zone() + "/" + name; }
+
+  // A parameter file whose line i holds `values[i]` for the given slots, 0
+  // elsewhere (580 lines).
+  void writeParameters(const std::vector<std::pair<int, std::string>>& lines) const;
+  void writeContours(const std::vector<std::vector<float>>& records) const;
+
+  // Runs the program with the arguments, in directory zone(), with TRXZONE and
+  // TRXTMPDIR set plus `extraEnv` ("NAME=value").
+  RunResult run(const std::vector<std::string>& args, const std::vector<std::string>& extraEnv = {}) const;
+
+ private:
+  TempDir dir_;
+};
+
+// Records of a closed square of side `size` at (x0, y0), z, and a separator.
+void appendSquare(std::vector<std::vector<float>>& records, float x0, float y0, float size, float z);
+
+}  // namespace pc::test
