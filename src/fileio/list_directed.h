@@ -15,7 +15,8 @@ inline constexpr int kListNoValue = -1;  // the record holds no further value
 
 // Reads the next value of `text` from `pos`, advancing `pos` past the value
 // and its separator. A null value (two commas) leaves `value` unchanged and
-// returns kListValue; so does a conversion error (positive result). Reals
+// returns kListValue; a conversion error (positive result) leaves it
+// unchanged too. Reals
 // take an optional exponent (E, e, D or d); "nan", "inf" and values beyond
 // the float range are errors, values below it read as zero. Integers are an
 // optional sign and digits within 32 bits.

@@ -589,4 +589,9 @@ const ParameterKey kParameterKeyTable[kParameterSlots + 1] = {
     {ParamKind::Length, "_UNUSED_"},  // 580
 };
 
+std::string_view parameterKeyName(int slot) {
+  if (slot < 1 || slot > kParameterSlots) return {};
+  return kParameterKeyTable[slot].name;
+}
+
 }  // namespace pc

@@ -24,7 +24,19 @@ struct FixedVersionInfo {
   std::uint32_t fileDateLow = 0;
 };
 
-// 0 on success; `file` null means the running program's own file.
+inline constexpr std::uint32_t kFixedVersionSignature = 0xFEEF04BD;
+
+// Results of readVersionInfo.
+inline constexpr int kVersionOk = 0;
+inline constexpr int kVersionNoFileName = 1;  // own file name not available
+inline constexpr int kVersionUnreadable = 2;  // cannot open the file
+inline constexpr int kVersionNotElf = 3;      // not an ELF file, or damaged headers
+inline constexpr int kVersionMissing = 4;     // no version section
+inline constexpr int kVersionDamaged = 5;     // section present but unusable
+
+// 0 on success; `file` null means the running program's own file. The
+// strings are keyed "\StringFileInfo\<language><code page>\<name>" (eight
+// lower-case hexadecimal digits), for the twelve predefined names found.
 int readVersionInfo(const char* file, std::map<std::string, std::string>& strings,
                     FixedVersionInfo& fixed);
 

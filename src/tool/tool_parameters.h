@@ -3,7 +3,9 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <memory>
+#include <span>
 
 namespace pc {
 
@@ -24,9 +26,27 @@ struct ToolParameters {
 // allocation leaves the corresponding pointer empty.
 int allocateToolParameters(ToolParameters& block, int extra);
 
-// Fills the block from "$TMP/outil.par"; value position 0 receives the
-// outcome (the slot count on success, 0 on failure).
+// Where the reader gets the two things that do not come from the parameter
+// file: the text of a zone database record (status >= 1 when found) and the
+// unit scale. The defaults ask the work-zone database and the unit scale of
+// the run.
+struct ParameterSources {
+  std::function<int(int, std::span<char>)> zoneText;
+  std::function<void(float*)> unitScale;
+};
+ParameterSources defaultParameterSources();
+
+// Code of the zone record holding the stock-allowance increment.
+inline constexpr int kStockAllowanceRecord = 31;
+
+// Fills slots 1..*slotCount from "$TMP/outil.par", adds the zone's
+// stock-allowance increment to slot 10 and multiplies the length slots by the
+// unit scale. Value position 0 receives the outcome: the slot count when the
+// file was read to its end or up to the last slot, 0 when it could not be
+// opened or a line could not be read or converted.
 void readToolParameters(float* values, char* texts, int textWidth, const int* slotCount);
+void readToolParameters(float* values, char* texts, int textWidth, const int* slotCount,
+                        const ParameterSources& sources);
 
 // Kind of slot s (0..580); ParamKind::None outside.
 ParamKind parameterKind(int slot);
