@@ -78,13 +78,15 @@ struct Unit {
   Unit& operator=(const Unit&) = delete;
   ~Unit() { flushWrites(); }
 
+  // The logical position: where the next record is read or written. When
+  // idle it is bufferOffset, and the stream is moved there before use.
   std::int64_t position() const {
     switch (transfer) {
       case Transfer::Reading: return bufferOffset + static_cast<std::int64_t>(cursor);
       case Transfer::Writing: return bufferOffset + static_cast<std::int64_t>(length);
       case Transfer::Idle: break;
     }
-    return filePosition;
+    return bufferOffset;
   }
 
   void flushWrites() {
@@ -134,8 +136,8 @@ struct Unit {
   void beginReading() {
     if (transfer == Transfer::Reading) return;
     flushWrites();
+    if (filePosition != bufferOffset && !seekTo(bufferOffset)) readFailed = true;
     transfer = Transfer::Reading;
-    bufferOffset = filePosition;
     length = cursor = 0;
   }
 
@@ -178,17 +180,15 @@ struct Unit {
   bool beginWriting() {
     if (transfer == Transfer::Writing) return true;
     const std::int64_t start = position();
-    transfer = Transfer::Idle;
-    length = cursor = 0;
-    afterEnd = false;
     bool lineOpen = false;
     if (form == FileForm::Formatted && start > 0) {
       unsigned char last = 0;
       // A last line without its line end gets one before the new record.
       lineOpen = peekAt(start - 1, &last, 1) && last != '\n';
-      transfer = Transfer::Idle;
-      length = cursor = 0;
     }
+    transfer = Transfer::Idle;
+    length = cursor = 0;
+    afterEnd = false;
     std::error_code ec;
     const auto size = std::filesystem::file_size(name, ec);
     if (!ec && static_cast<std::uintmax_t>(start) < size) {
@@ -392,7 +392,10 @@ int backspaceUnit(int unit) {
 
   // Formatted: the previous line starts after the line end before its own.
   unsigned char last = 0;
-  if (!u->peekAt(here - 1, &last, 1)) return kIoErrorSystem;
+  if (!u->peekAt(here - 1, &last, 1)) {
+    u->setPosition(here);
+    return kIoErrorSystem;
+  }
   std::int64_t scanEnd = last == '\n' ? here - 1 : here;  // exclusive
   std::vector<unsigned char> chunk(kBackScanChunk);
   while (scanEnd > 0) {

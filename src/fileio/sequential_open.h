@@ -14,7 +14,8 @@ bool filePresent(std::string_view name);
 
 // Opens a formatted sequential file. Modes: 1 read, 2 write (replace), 3
 // append; a negative mode makes every failure fatal. Returns the error code
-// (0 success, 1..5 as documented in sequential_open.cpp).
+// (0 success, 1..5 as documented in sequential_open.cpp). The unit is
+// closed after a failure.
 int opensq(int unit, std::string_view name, int mode);
 
 // Opens an unformatted sequential file; returns the name expansion's code.
