@@ -30,6 +30,13 @@ void WorkZone::writeContours(const std::vector<std::vector<float>>& records) con
 }
 
 RunResult WorkZone::run(const std::vector<std::string>& args, const std::vector<std::string>& extraEnv) const {
+  std::vector<std::string> env{"TRXZONE=" + zone(), "TRXTMPDIR=" + tmp()};
+  env.insert(env.end(), extraEnv.begin(), extraEnv.end());
+  return runProgram(args, env, zone());
+}
+
+RunResult runProgram(const std::vector<std::string>& args, const std::vector<std::string>& extraEnv,
+                     const std::string& cwd) {
   // The child starts from this process's environment minus the variables that
   // would point it elsewhere.
   std::vector<std::string> env;
@@ -38,8 +45,6 @@ RunResult WorkZone::run(const std::vector<std::string>& args, const std::vector<
     if (entry.rfind("TRX", 0) == 0) continue;
     env.push_back(entry);
   }
-  env.push_back("TRXZONE=" + zone());
-  env.push_back("TRXTMPDIR=" + tmp());
   for (const auto& e : extraEnv) env.push_back(e);
 
   int pipeFds[2];
@@ -49,7 +54,7 @@ RunResult WorkZone::run(const std::vector<std::string>& args, const std::vector<
     close(pipeFds[0]);
     dup2(pipeFds[1], STDOUT_FILENO);
     close(pipeFds[1]);
-    if (chdir(zone().c_str()) != 0) _exit(127);
+    if (chdir(cwd.c_str()) != 0) _exit(127);
     std::vector<char*> argv{const_cast<char*>(PC_EXECUTABLE)};
     for (const auto& a : args) argv.push_back(const_cast<char*>(a.c_str()));
     argv.push_back(nullptr);
@@ -69,6 +74,14 @@ RunResult WorkZone::run(const std::vector<std::string>& args, const std::vector<
   waitpid(pid, &status, 0);
   if (WIFEXITED(status)) result.exitStatus = WEXITSTATUS(status);
   return result;
+}
+
+std::string expectedBanner() {
+  return "*****************************************************\n"
+         "***          POCKET CLASSIFICATION\n"
+         "***\n"
+         "***      (Version : " + std::to_string(PC_BANNER_VERSION) + ")\n"
+         "*****************************************************\n";
 }
 
 void appendSquare(std::vector<std::vector<float>>& records, float x0, float y0, float size, float z) {

@@ -14,6 +14,11 @@ struct RunResult {
   std::string out;
 };
 
+// Runs the executable with exactly the environment `env` ("NAME=value", on top
+// of this process's environment without its TRX* variables) in `cwd`.
+RunResult runProgram(const std::vector<std::string>& args, const std::vector<std::string>& env,
+                     const std::string& cwd);
+
 // A work zone whose temporary directory ($TMP, through TRXTMPDIR) is zone/tmp.
 class WorkZone {
  public:
@@ -35,6 +40,9 @@ class WorkZone {
  private:
   TempDir dir_;
 };
+
+// The five banner lines of every run.
+std::string expectedBanner();
 
 // Records of a closed square of side `size` at (x0, y0), z, and a separator.
 void appendSquare(std::vector<std::vector<float>>& records, float x0, float y0, float size, float z);

@@ -8,14 +8,6 @@
 namespace pc::test {
 namespace {
 
-std::string banner() {
-  return "*****************************************************\n"
-         "***          POCKET CLASSIFICATION\n"
-         "***\n"
-         "***      (Version : " + std::to_string(PC_BANNER_VERSION) + ")\n"
-         "*****************************************************\n";
-}
-
 std::vector<std::vector<float>> oneSquare() {
   std::vector<std::vector<float>> records;
   appendSquare(records, 0.0f, 0.0f, 10.0f, 10.0f);
@@ -27,7 +19,7 @@ TEST(RunModes, OneSquareInPocketResultModePrintsEveryStep) {
   wz.writeContours(oneSquare());
   const RunResult r = wz.run({"x"});
   EXPECT_EQ(r.exitStatus, 0);
-  EXPECT_EQ(r.out, banner() +
+  EXPECT_EQ(r.out, expectedBanner() +
                        "\n Tool : # FLATEND(R=0.00mm)\n\n INITIALIZATION...\n NZ=1 NP=6 NC=1\n"
                        "\n LOADING Z-CONTOURS...\n 1 contours\n\n BUILDING POCKETS IN EACH Z-LEVEL...\n"
                        " 1 z-levels\n\n LEVEL-BASED POCKET CLASSIFICATION...\n 1 pockets\n"
