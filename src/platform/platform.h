@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace pc::platform {
@@ -66,5 +67,11 @@ struct LocalTime {
 // cannot be converted).
 std::int64_t currentTime();
 std::optional<LocalTime> localTime(std::int64_t secondsSinceEpoch);
+
+// Creates `name` only when it does not exist yet, readable and writable by
+// its owner only, and writes `content` into it. A file whose content could
+// not be written is removed again.
+enum class ExclusiveCreation { Created, Exists, Failed, WriteFailed };
+ExclusiveCreation createExclusiveFile(const std::string& name, std::string_view content);
 
 }  // namespace pc::platform

@@ -3,6 +3,7 @@
 #ifndef _WIN32
 
 #include <dirent.h>
+#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -110,6 +111,27 @@ std::optional<LocalTime> localTime(std::int64_t secondsSinceEpoch) {
   std::tm tm {};
   if (::localtime_r(&t, &tm) == nullptr) return std::nullopt;
   return LocalTime{tm.tm_year + 1900, tm.tm_mon + 1, tm.tm_mday, tm.tm_hour, tm.tm_min, tm.tm_sec};
+}
+
+ExclusiveCreation createExclusiveFile(const std::string& name, std::string_view content) {
+  const int fd = ::open(name.c_str(), O_CREAT | O_EXCL | O_RDWR, S_IRUSR | S_IWUSR);
+  if (fd < 0) return errno == EEXIST ? ExclusiveCreation::Exists : ExclusiveCreation::Failed;
+  std::size_t done = 0;
+  bool written = true;
+  while (done < content.size()) {
+    const ssize_t n = ::write(fd, content.data() + done, content.size() - done);
+    if (n < 0 && errno == EINTR) continue;
+    if (n <= 0) {
+      written = false;
+      break;
+    }
+    done += static_cast<std::size_t>(n);
+  }
+  if (::close(fd) != 0 || !written) {
+    ::unlink(name.c_str());
+    return ExclusiveCreation::WriteFailed;
+  }
+  return ExclusiveCreation::Created;
 }
 
 }  // namespace pc::platform

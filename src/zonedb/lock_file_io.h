@@ -1,5 +1,5 @@
-// File primitives of the zone lock: exclusive creation (not offered by the
-// platform layer yet) and a bounded read of the holder's process number.
+// File primitives of the zone lock: exclusive creation and a bounded read of
+// the holder's process number.
 #pragma once
 
 #include <cstddef>
