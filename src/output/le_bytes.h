@@ -3,6 +3,7 @@
 // fields use.
 #pragma once
 
+#include <bit>
 #include <cmath>
 #include <cstdint>
 #include <cstring>
@@ -10,34 +11,46 @@
 
 namespace pc {
 
-inline unsigned char* putUint32LE(unsigned char* out, std::uint32_t v) {
-  out[0] = static_cast<unsigned char>(v);
-  out[1] = static_cast<unsigned char>(v >> 8);
-  out[2] = static_cast<unsigned char>(v >> 16);
-  out[3] = static_cast<unsigned char>(v >> 24);
+inline char* putUint32LE(char* out, std::uint32_t v) {
+  if constexpr (std::endian::native == std::endian::little) {
+    std::memcpy(out, &v, sizeof v);  // one store instead of four
+    return out + 4;
+  }
+  out[0] = static_cast<char>(v);
+  out[1] = static_cast<char>(v >> 8);
+  out[2] = static_cast<char>(v >> 16);
+  out[3] = static_cast<char>(v >> 24);
   return out + 4;
 }
 
-inline unsigned char* putInt32LE(unsigned char* out, std::int32_t v) {
+inline char* putInt32LE(char* out, std::int32_t v) {
   return putUint32LE(out, static_cast<std::uint32_t>(v));
 }
 
-inline unsigned char* putInt16LE(unsigned char* out, std::int16_t v) {
+inline char* putInt16LE(char* out, std::int16_t v) {
   const auto u = static_cast<std::uint16_t>(v);
-  out[0] = static_cast<unsigned char>(u);
-  out[1] = static_cast<unsigned char>(u >> 8);
+  if constexpr (std::endian::native == std::endian::little) {
+    std::memcpy(out, &u, sizeof u);
+    return out + 2;
+  }
+  out[0] = static_cast<char>(u);
+  out[1] = static_cast<char>(u >> 8);
   return out + 2;
 }
 
-inline unsigned char* putFloatLE(unsigned char* out, float v) {
+inline char* putFloatLE(char* out, float v) {
   std::uint32_t bits = 0;
   std::memcpy(&bits, &v, sizeof bits);
   return putUint32LE(out, bits);
 }
 
-inline unsigned char* putDoubleLE(unsigned char* out, double v) {
+inline char* putDoubleLE(char* out, double v) {
   std::uint64_t bits = 0;
   std::memcpy(&bits, &v, sizeof bits);
+  if constexpr (std::endian::native == std::endian::little) {
+    std::memcpy(out, &bits, sizeof bits);
+    return out + 8;
+  }
   out = putUint32LE(out, static_cast<std::uint32_t>(bits));
   return putUint32LE(out, static_cast<std::uint32_t>(bits >> 32));
 }

@@ -1,0 +1,20 @@
+// The level dump "$TMP/wlevel.tmp" of run mode 4: the outlines of every
+// outer contour of every level as point records, with an index per level.
+#pragma once
+
+#include <cstdint>
+
+#include "pockets/pocket_model.h"
+
+namespace pc {
+
+inline constexpr const char* kLevelDumpName = "$TMP/wlevel.tmp";
+inline constexpr const char* kLevelDumpMode = "w+b";
+
+// Writes the dump of `levels[0..levelCount)`. 1 on success; -1 when the name
+// cannot be expanded, the file cannot be created, an outline fails the
+// outline check (the levels before it stay indexed) or the index or header
+// cannot be written. A failed dump does not stop the run.
+int writeLevelDump(ZLevel* levels, std::int32_t levelCount);
+
+}  // namespace pc

@@ -1,0 +1,118 @@
+// Record contour file: a sequential unformatted file (each record framed by
+// its byte count as a little-endian int32 before and after the data), one
+// record of 18 data bytes per outline entry and a final separator record:
+//
+//   offset  size  type     point record      separator record
+//   0       4     float32  x                 99999.0
+//   4       4     float32  y                 99999.0
+//   8       4     float32  Z of the pocket   99999.0
+//   12      4     int32    -1003             -1001
+//   16      2     int16    1                 0
+#include "output/record_contour_file.h"
+
+#include <cstring>
+
+#include "env/path_expander.h"
+#include "fileio/record_runtime.h"
+#include "fileio/sequential_open.h"
+#include "output/le_bytes.h"
+#include "output/lost_output.h"
+#include "output/outline_check.h"
+#include "output/outline_list.h"
+#include "output/output_file.h"
+
+namespace pc {
+
+namespace {
+
+constexpr std::size_t kRecordSize = 18;
+constexpr int kCreateNewFile = 2;
+
+int defaultFreeUnit() { return fileio::freeUnit(); }
+int defaultOpenUnformatted(int unit, std::string_view name, int mode) {
+  return fileio::openUnformatted(unit, name, mode);
+}
+bool defaultIsUnitOpen(int unit) { return fileio::isUnitOpen(unit); }
+int defaultWriteRecord(int unit, const void* data, std::size_t size) { return fileio::writeRecord(unit, data, size); }
+int defaultCloseUnit(int unit, bool deleteFile) { return fileio::closeUnit(unit, deleteFile); }
+
+[[noreturn]] void loseRecordContourFile() {
+  char name[512];
+  std::strcpy(name, kRecordContourFileName);
+  expandNameInPlace(name, sizeof name);
+  reportLostOutput(name, kRecordContourFileMode);
+}
+
+// The unit layer takes a file it cannot create for a fatal runtime error;
+// the file is created once here first, so that its loss is reported like
+// that of every other output. The layer then replaces it.
+void ensureCreatable() {
+  char name[512];
+  std::strcpy(name, kRecordContourFileName);
+  if (expandNameInPlace(name, sizeof name) != EXPAND_OK) return;  // left to the layer's status
+  std::FILE* file = outputFileHooks().open(name, kRecordContourFileMode);
+  if (file == nullptr || outputFileHooks().close(file) != 0) reportLostOutput(name, kRecordContourFileMode);
+}
+
+}  // namespace
+
+RecordUnitOps defaultRecordUnitOps() {
+  return RecordUnitOps{defaultFreeUnit, defaultOpenUnformatted, defaultIsUnitOpen, defaultWriteRecord,
+                       defaultCloseUnit};
+}
+
+RecordUnitOps& recordUnitOps() {
+  static RecordUnitOps ops = defaultRecordUnitOps();
+  return ops;
+}
+
+void openRecordContourFile(int& unit, int& status) {
+  unit = recordUnitOps().freeUnit();
+  if (unit < 0) loseRecordContourFile();  // no unit to open the file on
+  status = recordUnitOps().openUnformatted(unit, kRecordContourFileName, kCreateNewFile);
+  if (status == EXPAND_NOT_FOUND) status = 0;
+}
+
+void writeContourRecord(int unit, float x, float y, float z, std::int32_t code, std::int16_t flag) {
+  char data[kRecordSize];
+  putInt16LE(putInt32LE(putFloatLE(putFloatLE(putFloatLE(data, x), y), z), code), flag);
+  if (recordUnitOps().writeRecord(unit, data, sizeof data) != 0) loseRecordContourFile();
+}
+
+void closeRecordContourFile(int unit) {
+  writeContourRecord(unit, kSeparatorValue, kSeparatorValue, kSeparatorValue, kRecordSeparatorCode, 0);
+  if (recordUnitOps().closeUnit(unit, false) != 0) loseRecordContourFile();
+}
+
+int writeRecordContourFile(const CheckedArray<Pocket*>& pockets) {
+  if (pockets.count < 1) return 0;
+  CheckedArray<Point> outline = makeOutlineList(pockets);
+
+  ensureCreatable();
+  int unit = -1;
+  int status = 0;
+  openRecordContourFile(unit, status);
+  if (status != 0) return -1;
+  if (!recordUnitOps().isUnitOpen(unit)) loseRecordContourFile();
+
+  for (std::int32_t i = 0; i < pockets.count; ++i) {
+    float z = 0.0f;
+    if (collectPocketOutline(*pockets.data[i], outline, z) < 1) continue;
+    if (checkOutline(outline.data, outline.count, z, kOutlineClosureTolerance) != 0) {
+      closeRecordContourFile(unit);
+      return -1;
+    }
+    for (std::int32_t e = 0; e < outline.count; ++e) {
+      const Point& p = outline.data[e];
+      if (isPointEntry(p)) {
+        writeContourRecord(unit, p.x, p.y, z, kRecordPointCode, 1);
+      } else {
+        writeContourRecord(unit, kSeparatorValue, kSeparatorValue, kSeparatorValue, kRecordSeparatorCode, 0);
+      }
+    }
+  }
+  closeRecordContourFile(unit);
+  return 0;
+}
+
+}  // namespace pc
