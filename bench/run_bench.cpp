@@ -31,6 +31,7 @@ struct Measure {
 
 // Runs the program once in `dir` (its $TMP) with `mode`, output discarded.
 Measure runProgram(const std::string& dir, const char* mode) {
+  std::fflush(stdout);  // the child must not inherit unwritten lines
   const auto start = Clock::now();
   const pid_t pid = fork();
   if (pid == 0) {
