@@ -15,6 +15,7 @@
 #include "contours/point_loader.h"
 #include "driver/checked_array.h"
 #include "driver/fatal_report.h"
+#include "driver/float_truncation.h"
 #include "driver/run_mode.h"
 #include "env/path_expander.h"
 #include "output/contour_file_rewrite.h"
@@ -77,14 +78,14 @@ ToolParameters readParameters() {
   ToolParameters block;
   allocateToolParameters(block, 0);
   if (!block.values || !block.texts) FatalReport(kDriverSourceName, __LINE__, kMemoryAllocationFailure);
-  const int slotCount = truncateToInt(block.values[0]);
+  const int slotCount = truncateToInt32(block.values[0]);
   readToolParameters(block.values.get(), block.texts.get(), kParameterTextWidth, &slotCount);
   block.texts.reset();
   return block;
 }
 
 void printToolLine(ToolParameters& parameters, float scale) {
-  const int toolpath = truncateToInt(parameters.slot(kSlotToolpathNumber));
+  const int toolpath = truncateToInt32(parameters.slot(kSlotToolpathNumber));
   loadView(kToolViewKind, static_cast<double>(scale), toolFilePath(toolpath, ".mul"));
   const float r = parameters.slot(kSlotCornerRadius);
   float bodyRadius = parameters.slot(kSlotBodyRadius);
@@ -124,7 +125,7 @@ std::vector<ZLevel> groupIntoLevels(ZContour* contours, std::int32_t contourCoun
 }
 
 bool levelBasedClassification(std::size_t levelCount, ToolParameters& parameters) {
-  return levelCount == 1 || truncateToInt(parameters.slot(kSlotMachiningOrder)) == kLevelBasedOrder;
+  return levelCount == 1 || truncateToInt32(parameters.slot(kSlotMachiningOrder)) == kLevelBasedOrder;
 }
 
 // Marks a run that ends without any pocket to write.

@@ -1,9 +1,6 @@
-// The run mode chosen by the first character of the first argument, and the
-// safe float-to-integer truncation the run uses on parameter values.
+// The run mode chosen by the first character of the first argument.
 #pragma once
 
-#include <cmath>
-#include <cstdint>
 
 namespace pc {
 
@@ -24,16 +21,6 @@ inline RunMode runModeFromArguments(int argc, char** argv) {
     case 'w': return RunMode::LevelDumpThenRecords;
     default: return RunMode::PocketResultFile;
   }
-}
-
-// Truncation toward zero; a parameter file can hold any float, so values
-// outside the integer range are clamped (NaN gives 0) instead of being
-// undefined behaviour.
-inline int truncateToInt(float value) {
-  if (std::isnan(value)) return 0;
-  if (value >= 2147483647.0f) return INT32_MAX;
-  if (value <= -2147483648.0f) return INT32_MIN;
-  return static_cast<int>(value);
 }
 
 }  // namespace pc

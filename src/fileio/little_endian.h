@@ -36,4 +36,25 @@ inline std::int16_t loadInt16LE(const unsigned char* p) {
 inline float loadFloatLE(const unsigned char* p) { return std::bit_cast<float>(loadLE32(p)); }
 inline void storeFloatLE(unsigned char* p, float v) { storeLE32(p, std::bit_cast<std::uint32_t>(v)); }
 
+// Appending forms for writers that fill a byte buffer: each stores its value
+// at `out` and returns the position after it.
+inline char* putInt32LE(char* out, std::int32_t v) {
+  storeInt32LE(reinterpret_cast<unsigned char*>(out), v);
+  return out + 4;
+}
+inline char* putInt16LE(char* out, std::int16_t v) {
+  storeInt16LE(reinterpret_cast<unsigned char*>(out), v);
+  return out + 2;
+}
+inline char* putFloatLE(char* out, float v) {
+  storeFloatLE(reinterpret_cast<unsigned char*>(out), v);
+  return out + 4;
+}
+inline char* putDoubleLE(char* out, double v) {
+  const auto bits = std::bit_cast<std::uint64_t>(v);
+  storeLE32(reinterpret_cast<unsigned char*>(out), static_cast<std::uint32_t>(bits));
+  storeLE32(reinterpret_cast<unsigned char*>(out) + 4, static_cast<std::uint32_t>(bits >> 32));
+  return out + 8;
+}
+
 }  // namespace pc::fileio

@@ -33,7 +33,8 @@
 
 #include "driver/checked_array.h"
 #include "env/path_expander.h"
-#include "output/le_bytes.h"
+#include "driver/float_truncation.h"
+#include "fileio/little_endian.h"
 #include "output/outline_check.h"
 #include "output/outline_list.h"
 #include "output/output_file.h"
@@ -57,7 +58,7 @@ struct DumpIndexEntry {
 
 void writeHeader(OutputFile& file, std::int32_t entries, std::int32_t records, std::int32_t ordered) {
   char bytes[kHeaderSize];
-  putInt32LE(putInt32LE(putInt32LE(bytes, entries), records), ordered);
+  fileio::putInt32LE(fileio::putInt32LE(fileio::putInt32LE(bytes, entries), records), ordered);
   file.write(bytes, sizeof bytes);
 }
 
@@ -65,10 +66,10 @@ void writeIndex(OutputFile& file, const CheckedArray<DumpIndexEntry>& index) {
   for (std::int32_t k = 0; k < index.count; ++k) {
     const DumpIndexEntry& e = index.data[k];
     char* p = file.reserve(kIndexEntrySize);
-    p = putInt32LE(putInt32LE(p, e.level), e.records);
-    p = putInt32LE(putInt32LE(p, e.records), e.offset);
-    p = putInt32LE(putInt32LE(p, e.records), 0);
-    p = putDoubleLE(p, e.z);
+    p = fileio::putInt32LE(fileio::putInt32LE(p, e.level), e.records);
+    p = fileio::putInt32LE(fileio::putInt32LE(p, e.records), e.offset);
+    p = fileio::putInt32LE(fileio::putInt32LE(p, e.records), 0);
+    p = fileio::putDoubleLE(p, e.z);
     file.commit(p);
   }
 }
@@ -76,7 +77,7 @@ void writeIndex(OutputFile& file, const CheckedArray<DumpIndexEntry>& index) {
 void writeLevelList(OutputFile& file, const CheckedArray<DumpIndexEntry>& index) {
   for (std::int32_t k = 0; k < index.count; ++k) {
     char* p = file.reserve(4);
-    file.commit(putInt32LE(p, index.data[k].level));
+    file.commit(fileio::putInt32LE(p, index.data[k].level));
   }
 }
 
@@ -116,8 +117,8 @@ void writeLevelRecords(OutputFile& file, const CheckedArray<ContourNode*>& outer
     for (std::int32_t e = 0; e < outline.count; ++e) {
       const Point& point = outline.data[e];
       char* p = file.reserve(kRecordSize);
-      p = putInt32LE(putInt32LE(p, point.x > kSeparatorKindLimit ? 0 : 1), 0);
-      p = putDoubleLE(putDoubleLE(p, static_cast<double>(point.x)), static_cast<double>(point.y));
+      p = fileio::putInt32LE(fileio::putInt32LE(p, point.x > kSeparatorKindLimit ? 0 : 1), 0);
+      p = fileio::putDoubleLE(fileio::putDoubleLE(p, static_cast<double>(point.x)), static_cast<double>(point.y));
       file.commit(p);
     }
   }

@@ -15,7 +15,8 @@
 #include "env/path_expander.h"
 #include "fileio/record_runtime.h"
 #include "fileio/sequential_open.h"
-#include "output/le_bytes.h"
+#include "driver/float_truncation.h"
+#include "fileio/little_endian.h"
 #include "output/lost_output.h"
 #include "output/outline_check.h"
 #include "output/outline_list.h"
@@ -75,7 +76,7 @@ void openRecordContourFile(int& unit, int& status) {
 
 void writeContourRecord(int unit, float x, float y, float z, std::int32_t code, std::int16_t flag) {
   char data[kRecordSize];
-  putInt16LE(putInt32LE(putFloatLE(putFloatLE(putFloatLE(data, x), y), z), code), flag);
+  fileio::putInt16LE(fileio::putInt32LE(fileio::putFloatLE(fileio::putFloatLE(fileio::putFloatLE(data, x), y), z), code), flag);
   if (recordUnitOps().writeRecord(unit, data, sizeof data) != 0) loseRecordContourFile();
 }
 

@@ -16,7 +16,8 @@
 
 #include <cstring>
 
-#include "output/le_bytes.h"
+#include "driver/float_truncation.h"
+#include "fileio/little_endian.h"
 #include "output/lost_output.h"
 
 namespace pc {
@@ -35,7 +36,7 @@ TaggedFile openTaggedFile(const char* name, const char* mode) {
   if (!file.out.open(name, mode)) reportLostOutput(name, mode);
   if (mode[0] == 'w') {
     char mark[4];
-    putInt32LE(mark, kByteOrderMark);
+    fileio::putInt32LE(mark, kByteOrderMark);
     file.out.write(mark, sizeof mark);
   } else if (mode[0] == 'r') {
     unsigned char mark[4] = {0, 0, 0, 0};
@@ -56,22 +57,22 @@ int writeTaggedRecord(TaggedFile& file, char tag, float a, float b) {
   switch (tag) {
     case 'b':
     case 'p':
-      p = putFloatLE(putFloatLE(p, a), b);
+      p = fileio::putFloatLE(fileio::putFloatLE(p, a), b);
       break;
     case 'c':
     case 'r':
-      p = putInt32LE(putInt32LE(p, truncateToInt32(a)), truncateToInt32(b));
+      p = fileio::putInt32LE(fileio::putInt32LE(p, truncateToInt32(a)), truncateToInt32(b));
       break;
     case 'd':
     case 'm':
-      p = putInt32LE(p, truncateToInt32(a));
+      p = fileio::putInt32LE(p, truncateToInt32(a));
       break;
     case 'e':
     case 'n':
-      p = putInt32LE(putFloatLE(p, a), truncateToInt32(b));
+      p = fileio::putInt32LE(fileio::putFloatLE(p, a), truncateToInt32(b));
       break;
     case 'f':
-      p = putFloatLE(p, a);
+      p = fileio::putFloatLE(p, a);
       break;
     default:
       return 0;  // nothing committed

@@ -3,6 +3,7 @@
 #include <cmath>
 #include <limits>
 
+#include "driver/float_truncation.h"
 #include "driver/run_mode.h"
 
 namespace pc {
@@ -27,13 +28,13 @@ TEST(RunMode, OnlyTheFirstCharacterOfTheFirstArgumentCounts) {
 }
 
 TEST(RunMode, TruncationTowardZeroIsDefinedForEveryFloat) {
-  EXPECT_EQ(truncateToInt(2.9f), 2);
-  EXPECT_EQ(truncateToInt(-2.9f), -2);
-  EXPECT_EQ(truncateToInt(30012.0f), 30012);
-  EXPECT_EQ(truncateToInt(1e30f), INT32_MAX);
-  EXPECT_EQ(truncateToInt(-1e30f), INT32_MIN);
-  EXPECT_EQ(truncateToInt(std::numeric_limits<float>::quiet_NaN()), 0);
-  EXPECT_EQ(truncateToInt(std::numeric_limits<float>::infinity()), INT32_MAX);
+  EXPECT_EQ(truncateToInt32(2.9f), 2);
+  EXPECT_EQ(truncateToInt32(-2.9f), -2);
+  EXPECT_EQ(truncateToInt32(30012.0f), 30012);
+  EXPECT_EQ(truncateToInt32(1e30f), INT32_MAX);
+  EXPECT_EQ(truncateToInt32(-1e30f), INT32_MIN);
+  EXPECT_EQ(truncateToInt32(std::numeric_limits<float>::quiet_NaN()), 0);
+  EXPECT_EQ(truncateToInt32(std::numeric_limits<float>::infinity()), INT32_MAX);
 }
 
 }  // namespace
