@@ -12,11 +12,11 @@
 
 #include <cstring>
 
+#include "driver/float_truncation.h"
 #include "env/path_expander.h"
+#include "fileio/little_endian.h"
 #include "fileio/record_runtime.h"
 #include "fileio/sequential_open.h"
-#include "driver/float_truncation.h"
-#include "fileio/little_endian.h"
 #include "output/lost_output.h"
 #include "output/outline_check.h"
 #include "output/outline_list.h"
@@ -76,7 +76,8 @@ void openRecordContourFile(int& unit, int& status) {
 
 void writeContourRecord(int unit, float x, float y, float z, std::int32_t code, std::int16_t flag) {
   char data[kRecordSize];
-  fileio::putInt16LE(fileio::putInt32LE(fileio::putFloatLE(fileio::putFloatLE(fileio::putFloatLE(data, x), y), z), code), flag);
+  char* p = fileio::putFloatLE(fileio::putFloatLE(fileio::putFloatLE(data, x), y), z);
+  fileio::putInt16LE(fileio::putInt32LE(p, code), flag);
   if (recordUnitOps().writeRecord(unit, data, sizeof data) != 0) loseRecordContourFile();
 }
 
