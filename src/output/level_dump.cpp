@@ -32,7 +32,6 @@
 #include <limits>
 
 #include "driver/checked_array.h"
-#include "driver/float_truncation.h"
 #include "env/path_expander.h"
 #include "fileio/little_endian.h"
 #include "output/outline_check.h"

@@ -12,7 +12,6 @@
 
 #include <cstring>
 
-#include "driver/float_truncation.h"
 #include "env/path_expander.h"
 #include "fileio/little_endian.h"
 #include "fileio/record_runtime.h"
