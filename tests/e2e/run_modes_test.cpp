@@ -17,8 +17,10 @@ std::vector<std::vector<float>> oneSquare() {
 TEST(RunModes, OneSquareInPocketResultModePrintsEveryStep) {
   WorkZone wz;
   wz.writeContours(oneSquare());
+  writeFile(wz.tmpFile("offset2.err"), "stale");
   const RunResult r = wz.run({"x"});
   EXPECT_EQ(r.exitStatus, 0);
+  EXPECT_FALSE(fileExists(wz.tmpFile("offset2.err")));  // removed at the end of the run
   EXPECT_EQ(r.out, expectedBanner() +
                        "\n Tool : # FLATEND(R=0.00mm)\n\n INITIALIZATION...\n NZ=1 NP=6 NC=1\n"
                        "\n LOADING Z-CONTOURS...\n 1 contours\n\n BUILDING POCKETS IN EACH Z-LEVEL...\n"
