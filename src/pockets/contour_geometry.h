@@ -33,6 +33,14 @@ inline bool edgeCrossesRay(const Point& a, const Point& b, double px, double py)
   return ylo < py && py < yhi && (py - ylo) / (yhi - ylo) * (xhi - xlo) > px - xlo;
 }
 
+// Cheap pre-test of edgeCrossesRay, with `below` = py - 2 * epsilon: an
+// edge with both ends at or above the ray, or both clearly below it, cannot
+// cross (a crossing needs its lower end strictly below the ray and its upper
+// end above it or within the tolerance of it).
+inline bool edgeMayCross(float ya, float yb, double py, double below) {
+  return !((ya >= py && yb >= py) || (ya < below && yb < below));
+}
+
 // Bounding-box rejection of pointInContour, inclusive on the box edges.
 inline bool pointInBox(double px, double py, const ZContour& c) {
   return !(static_cast<double>(c.xmin) > px || px > static_cast<double>(c.xmax) ||
@@ -48,6 +56,20 @@ bool contourInContour(const ZContour& a, const ZContour& b);
 
 // The vertex indices that contourInContour samples; returns how many (<= 5).
 std::int32_t voteSamples(std::int32_t pointCount, std::int32_t (&samples)[5]);
+
+// The vote of contourInContour, with the point test `inside(point)` supplied
+// by the caller (the plain test, or one through an index of b's edges).
+template <typename Inside>
+bool sampleVote(const ZContour& a, Inside inside) {
+  std::int32_t samples[5];
+  const std::int32_t n = voteSamples(a.pointCount, samples);
+  if (n == 0) return false;
+  std::int32_t votes = 0;
+  for (std::int32_t i = 0; i < n; ++i) {
+    if (inside(a.points[samples[i]])) ++votes;
+  }
+  return votes >= n - votes;
+}
 
 // 0: apart, 1: a inside b, 2: b inside a.
 int contourRelation(const ZContour& a, const ZContour& b);

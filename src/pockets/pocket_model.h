@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <vector>
 
 #include "contours/point.h"
 #include "contours/zcontour.h"
@@ -13,6 +14,8 @@
 namespace pc {
 
 struct Pocket;
+class EdgeBuckets;
+class ChainIndex;
 
 // One contour in its level's containment tree. Even depth: the outer contour
 // of a region; odd depth: an island of its parent's region.
@@ -21,13 +24,25 @@ struct ContourNode {
   ContourNode* firstChild = nullptr;
   ContourNode* nextSibling = nullptr;
   ContourNode* parent = nullptr;
-  Pocket* pocket = nullptr;         // not owned; set at most once
+  Pocket* pocket = nullptr;         // not owned; cleared when the pocket is deleted
+  // Set once the region has been handled by pocket building, whether or not
+  // its pocket survived: a region is never taken twice.
+  bool taken = false;
+  // Search aids, owned with the node by its level: an index over the
+  // contour's edges (built for big contours once they are tested often) and
+  // a compact copy of the child chain (kept in step by addContourToLevel).
+  std::int32_t edgeTests = 0;
+  EdgeBuckets* edgeBuckets = nullptr;
+  ChainIndex* childChain = nullptr;
 };
 
 // One run of consecutive contours with exactly equal Z. Owns its nodes.
+// The tree is built by addContourToLevel only; a chain linked by other means
+// gets its compact copy from its links on first use.
 struct ZLevel {
   ContourNode* root = nullptr;
   std::unique_ptr<CheckedArray<ContourNode*>> outerCache;
+  ChainIndex* rootChain = nullptr;  // compact copy of the top-level chain, owned
 
   ZLevel() = default;
   ZLevel(ZLevel&& other) noexcept;
@@ -37,12 +52,18 @@ struct ZLevel {
   ~ZLevel();  // deletes every node of the tree (iteratively)
 };
 
+// Number of nodes in the level's tree, all depths.
+std::int32_t nodeCount(const ZLevel& level);
+
 // A region made into a pocket, hanging from a pocket of the previous level.
 struct Pocket {
   ContourNode* node = nullptr;
   Pocket* firstChild = nullptr;
   Pocket* nextSibling = nullptr;
   Pocket* parent = nullptr;
+  // End of the child chain while pockets are being built (chains are only
+  // extended at their end there); absent outside buildPockets.
+  Pocket* lastChild = nullptr;
 };
 
 // The pockets of the run and the scratch of their building and ordering.
@@ -52,11 +73,13 @@ struct PocketForest {
   RecyclingQueue<Pocket*> queue;
   std::int32_t centroidCapacity = 0;
   std::unique_ptr<Point[]> centroids;
+  std::vector<double> crossings;  // scratch of the interior-point search
 
   PocketForest() = default;
   PocketForest(const PocketForest&) = delete;
   PocketForest& operator=(const PocketForest&) = delete;
-  ~PocketForest();  // deletes every pocket (iteratively)
+  ~PocketForest();  // deletes every pocket (iteratively); touches no node, so
+                    // it may run after the levels are gone
 };
 
 // Inserts one contour into the level's containment tree.
@@ -70,10 +93,14 @@ CheckedArray<ContourNode*>& outerNodes(ZLevel& level);
 // interior point (that region got no pocket, building went on).
 int buildPockets(PocketForest& forest, ZLevel* levels, std::int32_t levelCount);
 
-// Number of pockets reachable from the roots.
+// Number of pockets reachable from the roots. Like every walk over the
+// forest it climbs back up through `parent`, so each pocket's `parent` must
+// be the pocket whose child chain holds it (absent for roots).
 std::int32_t pocketCount(const PocketForest& forest);
 
-// Deletes a pocket and everything under it (iteratively).
+// Deletes a pocket and everything under it (iteratively); its following
+// siblings are left alone and the caller unlinks it. The nodes of deleted
+// pockets lose their `pocket` pointer but stay taken.
 void deletePocketTree(Pocket* pocket);
 
 // Fills `outline` with the pocket's outer contour and its islands, each run
