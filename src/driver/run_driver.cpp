@@ -7,7 +7,7 @@
 #include <cstdint>
 #include <cstdio>
 #include <memory>
-#include <new>
+#include <type_traits>
 #include <vector>
 
 #include "contours/contour_assembly.h"
@@ -22,6 +22,7 @@
 #include "output/level_dump.h"
 #include "output/pocket_result_file.h"
 #include "output/record_contour_file.h"
+#include "platform/platform.h"
 #include "pockets/level_order.h"
 #include "pockets/pocket_model.h"
 #include "pockets/width_filter.h"
@@ -54,15 +55,26 @@ constexpr int kLevelBasedOrder = 2;
 // arrays: a boxed report and status 1.
 constexpr const char* kDriverSourceName = "run_driver";
 
+// One of the run's large arrays. Its entries are written by the loaders
+// before they are read, so the block is not initialised here.
 template <typename T>
-std::unique_ptr<T[]> allocateArray(std::int64_t entries, bool zeroed) {
-  T* block = nullptr;
+struct RunArray {
+  static_assert(std::is_trivially_copyable_v<T> && std::is_trivially_destructible_v<T>);
+  struct Release {
+    void operator()(T* block) const { platform::releaseLarge(block); }
+  };
+  std::unique_ptr<T, Release> block;
+  T* get() const { return block.get(); }
+};
+
+template <typename T>
+RunArray<T> allocateArray(std::int64_t entries) {
+  RunArray<T> array;
   if (entries > 0 && entries <= INT32_MAX) {
-    const auto n = static_cast<std::size_t>(entries);
-    block = zeroed ? new (std::nothrow) T[n]() : new (std::nothrow) T[n];
+    array.block.reset(static_cast<T*>(platform::allocateLarge(static_cast<std::size_t>(entries) * sizeof(T))));
   }
-  if (block == nullptr) FatalReport(kDriverSourceName, __LINE__, kMemoryAllocationFailure);
-  return std::unique_ptr<T[]>(block);
+  if (!array.block) FatalReport(kDriverSourceName, __LINE__, kMemoryAllocationFailure);
+  return array;
 }
 
 void printBanner() {
@@ -161,9 +173,9 @@ int runPocketClassifier(int argc, char** argv) {
 
   const std::int64_t pointCapacity = std::int64_t{counts.np} + kSpareEntries;
   const std::int64_t contourCapacity = std::int64_t{counts.nc} + kSpareEntries;
-  auto points = allocateArray<Point>(pointCapacity, true);
-  auto zs = allocateArray<float>(pointCapacity, false);
-  auto contours = allocateArray<ZContour>(contourCapacity, true);
+  auto points = allocateArray<Point>(pointCapacity);
+  auto zs = allocateArray<float>(pointCapacity);
+  auto contours = allocateArray<ZContour>(contourCapacity);
   std::printf("\n");
   std::printf(" LOADING Z-CONTOURS...\n");
 
@@ -229,9 +241,9 @@ int runPocketClassifier(int argc, char** argv) {
   }
 
   levels.clear();
-  contours.reset();
-  zs.reset();
-  points.reset();
+  contours.block.reset();
+  zs.block.reset();
+  points.block.reset();
   parameters = ToolParameters{};
 
   removeStaleOffsetError();

@@ -2,6 +2,7 @@
 // that a Windows build only has to supply another implementation of this file.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -67,6 +68,13 @@ struct LocalTime {
 // cannot be converted).
 std::int64_t currentTime();
 std::optional<LocalTime> localTime(std::int64_t secondsSinceEpoch);
+
+// Storage for the run's large arrays: one uninitialised block, backed by huge
+// pages where the system offers them, which saves most of the page faults of
+// a multi-million-point part. nullptr when it cannot be had; release with
+// releaseLarge.
+void* allocateLarge(std::size_t bytes);
+void releaseLarge(void* block);
 
 // Creates `name` only when it does not exist yet, readable and writable by
 // its owner only, and writes `content` into it. A file whose content could

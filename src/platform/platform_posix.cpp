@@ -4,6 +4,7 @@
 
 #include <dirent.h>
 #include <fcntl.h>
+#include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -112,6 +113,20 @@ std::optional<LocalTime> localTime(std::int64_t secondsSinceEpoch) {
   if (::localtime_r(&t, &tm) == nullptr) return std::nullopt;
   return LocalTime{tm.tm_year + 1900, tm.tm_mon + 1, tm.tm_mday, tm.tm_hour, tm.tm_min, tm.tm_sec};
 }
+
+void* allocateLarge(std::size_t bytes) {
+  constexpr std::size_t kHugePage = std::size_t{2} << 20;
+  if (bytes < 2 * kHugePage) return std::malloc(bytes == 0 ? 1 : bytes);
+  const std::size_t rounded = (bytes + kHugePage - 1) / kHugePage * kHugePage;
+  void* block = nullptr;
+  if (::posix_memalign(&block, kHugePage, rounded) != 0) return nullptr;
+#ifdef MADV_HUGEPAGE
+  ::madvise(block, rounded, MADV_HUGEPAGE);  // a hint: refused advice changes nothing
+#endif
+  return block;
+}
+
+void releaseLarge(void* block) { std::free(block); }
 
 ExclusiveCreation createExclusiveFile(const std::string& name, std::string_view content) {
   const int fd = ::open(name.c_str(), O_CREAT | O_EXCL | O_RDWR, S_IRUSR | S_IWUSR);
