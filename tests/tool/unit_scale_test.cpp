@@ -2,28 +2,20 @@
 
 #include <gtest/gtest.h>
 
-#include <cmath>
 #include <filesystem>
 #include <limits>
+#include <vector>
 
 #include "env/env_testing.h"
 #include "support/test_support.h"
 #include "tool/unit_scale_testing.h"
 #include "zonedb/zone_database_testing.h"
-#include "zonedb/zone_file_builder.h"
 
 namespace pc {
 namespace {
 
-const char* const kBanner = " *******\n you are using local_scale ";
-
 class UnitScaleTest : public testing::Test {
  protected:
-  UnitScaleTest() {
-    env_testing::resetWorkZone();
-    unit_scale_testing::reset();
-    setDatabase(0, 0.0f);
-  }
   ~UnitScaleTest() override {
     unit_scale_testing::setZoneScaleQuery({});
     unit_scale_testing::reset();
@@ -33,148 +25,101 @@ class UnitScaleTest : public testing::Test {
   // The zone database answers `status` and, when found, `value`.
   void setDatabase(int status, float value) {
     unit_scale_testing::setZoneScaleQuery([this, status, value](float& out) {
-      ++queries_;
+      ++queries;
       if (status >= 1) out = value;
       return status;
     });
   }
 
-  // One deciding call: the scale, with the console output in `printed_`.
+  // One deciding call: the scale, with the console output in `printed`.
   float decide() {
+    env_testing::resetWorkZone();
     unit_scale_testing::reset();
     float scale = -99.0f;
     testing::internal::CaptureStdout();
     unitScale(&scale);
     std::fflush(stdout);
-    printed_ = testing::internal::GetCapturedStdout();
+    printed = testing::internal::GetCapturedStdout();
     return scale;
   }
 
-  std::string dat() const { return tmp_.file("localscale.dat"); }
-  std::string copy() const { return tmp_.file("localscale.tmp"); }
-
-  test::TempDir tmp_;
-  test::ScopedEnv tmpEnv_{"TRXTMPDIR", tmp_.path()};
-  test::ScopedEnv units_{"TRXUNITS", std::nullopt};
-  int queries_ = 0;
-  std::string printed_;
+  test::TempDir tmp;
+  test::ScopedEnv tmpEnv{"TRXTMPDIR", tmp.path()};
+  test::ScopedEnv units{"TRXUNITS", std::nullopt};
+  int queries = 0;
+  std::string printed;
 };
 
-TEST_F(UnitScaleTest, DatabaseScaleWithoutLocalFiles) {
-  setDatabase(1, 1.0f);
-  EXPECT_EQ(decide(), 1.0f);
-  EXPECT_EQ(printed_, "");
-  setDatabase(3, 25.4f);
-  EXPECT_EQ(decide(), 25.4f);
-  EXPECT_EQ(printed_, "");
-  EXPECT_TRUE(std::filesystem::is_empty(tmp_.path()));
-  EXPECT_EQ(unit_scale_testing::unitSystem(), 1);
-}
-
-TEST_F(UnitScaleTest, LocalScaleFileOverridesAndIsCopied) {
-  setDatabase(1, 25.4f);
-  test::writeFile(dat(), "  1.0   ignored\nsecond record\n");
-  EXPECT_EQ(decide(), 1.0f);
-  EXPECT_EQ(printed_, std::string(kBanner) + "25.4 1.0\n *******\n");
-  EXPECT_EQ(test::readFile(copy()), " 1.0\n");
-  EXPECT_EQ(test::readFile(dat()), "  1.0   ignored\nsecond record\n");
-
-  // The .dat file wins over an existing copy, which it replaces.
-  test::writeFile(dat(), "2.5e-1\n");
-  test::writeFile(copy(), " 7.0\n old\n");
-  EXPECT_EQ(decide(), 0.25f);
-  EXPECT_EQ(printed_, std::string(kBanner) + "25.4 0.25\n *******\n");
-  EXPECT_EQ(test::readFile(copy()), " 0.25\n");
-}
-
-TEST_F(UnitScaleTest, CopyIsUsedWhenTheDatFileIsAbsent) {
-  setDatabase(1, 1.0f);
-  test::writeFile(copy(), " 1.0\n");
-  EXPECT_EQ(decide(), 1.0f);
-  EXPECT_EQ(printed_, "");
-  setDatabase(1, 2.0f);
-  test::writeFile(copy(), "0.5,3\n");
-  EXPECT_EQ(decide(), 0.5f);
-  EXPECT_EQ(printed_, std::string(kBanner) + "2.0 0.5\n *******\n");
-  EXPECT_EQ(test::readFile(copy()), "0.5,3\n");
-  EXPECT_FALSE(test::fileExists(dat()));
-}
-
-TEST_F(UnitScaleTest, FilesWithoutAUsableScale) {
-  setDatabase(1, 2.0f);
-  const struct {
-    const char* content;
-    const char* copied;
-  } cases[] = {{"-5\n", " -5.0\n"}, {"", " -1.0\n"}, {"\n3.0\n", " -1.0\n"}, {"abc\n", " -1.0\n"}, {"nan\n", " -1.0\n"}};
-  for (const auto& c : cases) {
-    test::writeFile(dat(), c.content);
-    EXPECT_EQ(decide(), 2.0f) << c.content;
-    EXPECT_EQ(printed_, "") << c.content;
-    EXPECT_EQ(test::readFile(copy()), c.copied) << c.content;
+TEST_F(UnitScaleTest, DatabaseAndLocalScaleFiles) {
+  const char* const none = nullptr;
+  const float nan = std::numeric_limits<float>::quiet_NaN();
+  // Database status and value, then ".dat" and ".tmp" contents; the scale,
+  // the banner's two numbers and the ".tmp" file afterwards.
+  struct Row { int status; float database; const char* dat; const char* tmp; float scale; const char* banner;
+               const char* copy; };
+  std::vector<Row> rows = {
+      {1, 1.0f, none, none, 1.0f, none, none},    {3, 25.4f, none, none, 25.4f, none, none},
+      {-23, 0.0f, none, none, 1.0f, none, none},  {1, -3.0f, none, none, 1.0f, none, none},
+      {1, nan, none, none, 1.0f, none, none},
+      {1, 25.4f, "  1.0   ignored\nsecond record\n", none, 1.0f, "25.4 1.0", " 1.0\n"},
+      {1, 25.4f, "2.5e-1\n", " 7.0\n old\n", 0.25f, "25.4 0.25", " 0.25\n"},  // .dat wins, replaces the copy
+      {-23, 0.0f, "3.0\n", none, 3.0f, "1.0 3.0", " 3.0\n"},
+      {1, 2.0f, "0\n", none, 1.0f, "2.0 0.0", " 0.0\n"},  // announced, then replaced by 1
+      {1, 2.0f, "-5\n", none, 2.0f, none, " -5.0\n"},
+      {1, 1.0f, none, " 1.0\n", 1.0f, none, " 1.0\n"},
+      {1, 2.0f, none, "0.5,3\n", 0.5f, "2.0 0.5", "0.5,3\n"},
+      {1, 2.0f, none, " -1.0\n", 2.0f, none, " -1.0\n"}};
+  for (const char* noScale : {"", "\n3.0\n", "abc\n", "nan\n"}) {
+    rows.push_back({1, 2.0f, noScale, none, 2.0f, none, " -1.0\n"});
   }
-  // The copy holding -1.0 is no local scale either.
-  std::filesystem::remove(dat());
-  EXPECT_EQ(decide(), 2.0f);
-  EXPECT_EQ(printed_, "");
+  for (const Row& r : rows) {
+    SCOPED_TRACE(testing::Message() << r.status << " " << r.database << " dat " << (r.dat ? r.dat : "-")
+                                    << " tmp " << (r.tmp ? r.tmp : "-"));
+    test::TempDir dir;
+    test::ScopedEnv dirEnv("TRXTMPDIR", dir.path());
+    if (r.dat) test::writeFile(dir.file("localscale.dat"), r.dat);
+    if (r.tmp) test::writeFile(dir.file("localscale.tmp"), r.tmp);
+    setDatabase(r.status, r.database);
+    EXPECT_EQ(decide(), r.scale);
+    EXPECT_EQ(printed, r.banner ? " *******\n you are using local_scale " + std::string(r.banner) + "\n *******\n"
+                                : "");
+    const std::string copy = dir.file("localscale.tmp");
+    EXPECT_EQ(test::fileExists(copy) ? test::readFile(copy) : "(none)", r.copy ? r.copy : "(none)");
+    if (r.dat) {
+      EXPECT_EQ(test::readFile(dir.file("localscale.dat")), r.dat);
+    }
+  }
+
   // A .dat that cannot be opened is skipped silently; no copy is made.
-  std::filesystem::remove(copy());
-  std::filesystem::create_directory(dat());
-  EXPECT_EQ(decide(), 2.0f);
-  EXPECT_EQ(printed_, "");
-  EXPECT_FALSE(test::fileExists(copy()));
-}
-
-TEST_F(UnitScaleTest, FallbacksToOne) {
-  setDatabase(-23, 0.0f);
-  EXPECT_EQ(decide(), 1.0f);
-  test::writeFile(dat(), "3.0\n");
-  EXPECT_EQ(decide(), 3.0f);
-  EXPECT_EQ(printed_, std::string(kBanner) + "1.0 3.0\n *******\n");
-  std::filesystem::remove(dat());
-  std::filesystem::remove(copy());
-
-  for (const float bad : {0.0f, -3.0f, std::numeric_limits<float>::quiet_NaN(),
-                          std::numeric_limits<float>::infinity()}) {
-    setDatabase(1, bad);
-    EXPECT_EQ(decide(), 1.0f) << bad;
-    EXPECT_EQ(printed_, "");
-  }
-  // A zero local scale is announced, then replaced by 1.
+  std::filesystem::create_directory(tmp.file("localscale.dat"));
   setDatabase(1, 2.0f);
-  test::writeFile(dat(), "0\n");
-  EXPECT_EQ(decide(), 1.0f);
-  EXPECT_EQ(printed_, std::string(kBanner) + "2.0 0.0\n *******\n");
+  EXPECT_EQ(decide(), 2.0f);
+  EXPECT_EQ(printed, "");
+  EXPECT_FALSE(test::fileExists(tmp.file("localscale.tmp")));
 }
 
 TEST_F(UnitScaleTest, UnitSystemFromTrxunitsLeavesTheScaleAlone) {
   setDatabase(1, 25.4f);
-  const struct {
-    std::optional<std::string> value;
-    int system;
-  } cases[] = {{"inch", 2}, {"inch  ", 2}, {"Inch", 1}, {" inch", 1}, {"mm", 1}, {std::nullopt, 1}};
-  for (const auto& c : cases) {
-    test::ScopedEnv units("TRXUNITS", c.value);
+  const std::pair<std::optional<std::string>, int> cases[] = {
+      {"inch", 2}, {"inch  ", 2}, {"Inch", 1}, {" inch", 1}, {std::nullopt, 1}};
+  for (const auto& [value, system] : cases) {
+    test::ScopedEnv setting("TRXUNITS", value);
     EXPECT_EQ(decide(), 25.4f);
-    EXPECT_EQ(unit_scale_testing::unitSystem(), c.system) << c.value.value_or("(unset)");
+    EXPECT_EQ(unit_scale_testing::unitSystem(), system) << value.value_or("(unset)");
   }
 }
 
 TEST_F(UnitScaleTest, DecidedOncePerRun) {
   setDatabase(1, 25.4f);
-  test::writeFile(dat(), "2.0\n");
+  test::writeFile(tmp.file("localscale.dat"), "2.0\n");
   EXPECT_EQ(decide(), 2.0f);
-  EXPECT_EQ(queries_, 1);
-  test::writeFile(dat(), "4.0\n");
+  test::writeFile(tmp.file("localscale.dat"), "4.0\n");
   setDatabase(1, 8.0f);
-  queries_ = 0;
   float scale = 0.0f;
-  testing::internal::CaptureStdout();
   unitScale(&scale);
-  std::fflush(stdout);
-  EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
   EXPECT_EQ(scale, 2.0f);
-  EXPECT_EQ(queries_, 0);
-  EXPECT_EQ(test::readFile(copy()), " 2.0\n");
+  EXPECT_EQ(queries, 1);
+  EXPECT_EQ(test::readFile(tmp.file("localscale.tmp")), " 2.0\n");
 }
 
 TEST_F(UnitScaleTest, RealZoneDatabase) {
@@ -182,14 +127,17 @@ TEST_F(UnitScaleTest, RealZoneDatabase) {
   test::ScopedEnv zoneEnv("TRXZONE", zone.path());
   zonedb::resetZoneNamesForTesting();
   unit_scale_testing::setZoneScaleQuery({});
-  const test::ZoneBytes z;
-  test::writeFile(zone.file("zone.inf"),
-                  z.file({test::ZoneBytes::record("001C 002C 001R ", 'X', "EC", z.real(5.0f)),
-                          test::ZoneBytes::record("001C 002C 001R ", ' ', "EC", z.real(25.4f))}));
+  // A little-endian "zone.inf": 160-byte header, then one real record.
+  std::string file = "QZTB";
+  for (const int field : {0, 160, 160, 1}) test::putInt32(file, field);
+  file.resize(160, '\0');
+  file[154] = 1;
+  std::string record("001C 002C 001R \0 EC", 19);  // format, NUL, state, code
+  test::putFloat(record, 25.4f);
+  test::putInt16(file, static_cast<std::int16_t>(record.size()));
+  test::putInt16(file, 0);
+  test::writeFile(zone.file("zone.inf"), file + record);
   EXPECT_EQ(decide(), 25.4f);
-  std::filesystem::remove(zone.file("zone.inf"));
-  EXPECT_EQ(decide(), 1.0f);
-  EXPECT_TRUE(std::filesystem::is_empty(zone.path()));
   zonedb::resetZoneNamesForTesting();
 }
 
