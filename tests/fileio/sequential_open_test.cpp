@@ -1,3 +1,4 @@
+// The numbered-unit opening routines, and the fatal reports that end a run.
 #include "fileio/sequential_open.h"
 
 #include <gtest/gtest.h>
@@ -5,6 +6,8 @@
 #include <cstdio>
 #include <cstdlib>
 #include <string>
+#include <tuple>
+#include <vector>
 
 #include "env/configuration_lookup.h"
 #include "env/path_expander.h"
@@ -16,7 +19,39 @@ namespace pc::fileio {
 namespace {
 
 using test::readFile;
-using test::writeFile;
+
+// What a call that ends the process prints on standard output (run in a child).
+template <typename F>
+std::string fatalReport(const test::TempDir& dir, F call) {
+  const std::string out = dir.file("report.txt");
+  EXPECT_EXIT(
+      {
+        if (!std::freopen(out.c_str(), "w", stdout)) std::abort();
+        call();
+      },
+      ::testing::ExitedWithCode(kFatalStopStatus), "");
+  return readFile(out);
+}
+
+TEST(RuntimeFatal, MessageText) {
+  const std::tuple<std::string, std::vector<int>, std::string> cases[] = {
+      // Values take exactly the characters they need, nine at most.
+      {" iomode= %, err= %", {2, 5}, " iomode= 2, err= 5"}, {"v=%;", {-12}, "v=-12;"}, {"%%", {1, 2}, "12"},
+      {"%", {123456789}, "123456789"}, {"[%]", {1234567890}, "[*********]"},
+      // Template blanks are kept; a '%' without a value stays.
+      {"  a %  ", {7}, "  a 7  "}, {"a=% b=%", {1}, "a=1 b=%"},
+      // Beyond 198 characters the framing parenthesis goes, and one character more.
+      {std::string(198, 'x'), {}, std::string(198, 'x')}, {std::string(250, 'x'), {}, std::string(198, 'x')},
+      // A value growing the field pushes its end out.
+      {std::string(197, 'y') + "%", {12345}, std::string(197, 'y') + "1"},
+  };
+  for (const auto& [tmpl, values, expected] : cases) EXPECT_EQ(fatalMessageText(tmpl, values), expected) << tmpl;
+  // A blank routine name leaves out the heading record.
+  test::TempDir dir;
+  const int values[] = {2, 5};
+  EXPECT_EQ(fatalReport(dir, [&] { fatalErrorValues("   ", " iomode= %, err= %", values); }),
+            "  iomode= 2, err= 5\n Program terminated.\n");
+}
 
 constexpr char kUndefined[] = "$PC_H1_SURELY_UNDEFINED/x";
 
@@ -28,90 +63,66 @@ class SequentialOpen : public ::testing::Test {
     closeAllUnits();
     setConfigurationLookup(previousLookup);
   }
-  // The records a call prints before the process ends (run in a child).
-  template <typename F>
-  std::string fatalReport(F call) {
-    const std::string out = dir.file("report.txt");
-    EXPECT_EXIT(
-        {
-          if (!std::freopen(out.c_str(), "w", stdout)) std::abort();
-          call();
-        },
-        ::testing::ExitedWithCode(kFatalStopStatus), "");
-    return readFile(out);
+  std::string openReport(const std::string& name, int mode) {
+    return fatalReport(dir, [&] { opensq(5, name, mode); });
   }
 
   test::TempDir dir;
   ConfigurationLookup previousLookup = nullptr;
 };
 
-TEST_F(SequentialOpen, FreeUnitIsTheLowestClosedNumberFromThree) {
+TEST_F(SequentialOpen, ModesAndTheLowestFreeUnit) {
+  const std::string name = dir.file("f.txt");
+  test::writeFile(name, "old\nmore\n");
   EXPECT_EQ(freeUnit(), 3);
-  ASSERT_EQ(opensq(3, dir.file("a"), 2), 0);
+  ASSERT_EQ(opensq(3, name + "    ", 1), 0);  // a blank-padded field
   ASSERT_EQ(opensq(4, dir.file("b"), 2), 0);
   EXPECT_EQ(freeUnit(), 5);
-  closeUnit(3);
-  EXPECT_EQ(freeUnit(), 3);
-}
-
-TEST_F(SequentialOpen, ReadWriteAndAppendModes) {
-  const std::string name = dir.file("f.txt");
-  writeFile(name, "old\nmore\n");
-  ASSERT_EQ(opensq(7, name + "    ", 1), 0);  // a blank-padded field
   std::string line;
-  EXPECT_EQ(readTextRecord(7, line), kIoOk);
+  EXPECT_EQ(readTextRecord(3, line), kIoOk);
   EXPECT_EQ(line, "old");
-  ASSERT_EQ(opensq(7, name, 2), 0);  // the same unit, now replacing the file
+  ASSERT_EQ(opensq(3, name, 2), 0);  // the same unit, now replacing the file
   EXPECT_EQ(readFile(name), "");
-  EXPECT_EQ(writeTextRecord(7, "one"), kIoOk);
-  EXPECT_EQ(writeTextRecord(7, "two"), kIoOk);
-  EXPECT_EQ(closeUnit(7), kIoOk);
-  ASSERT_EQ(opensq(7, name, -3), 0);
-  EXPECT_EQ(writeTextRecord(7, "three"), kIoOk);
-  EXPECT_EQ(closeUnit(7), kIoOk);
-  EXPECT_EQ(readFile(name), "one\ntwo\nthree\n");
+  EXPECT_EQ(writeTextRecord(3, "one"), kIoOk);
+  EXPECT_EQ(closeUnit(3), kIoOk);
+  EXPECT_EQ(freeUnit(), 3);
+  ASSERT_EQ(opensq(3, name, -3), 0);
+  EXPECT_EQ(writeTextRecord(3, "two"), kIoOk);
+  EXPECT_EQ(closeUnit(3), kIoOk);
+  EXPECT_EQ(readFile(name), "one\ntwo\n");
 }
 
 TEST_F(SequentialOpen, FailuresGiveTheirCodeAndLeaveTheUnitClosed) {
-  EXPECT_EQ(opensq(9, dir.file("missing.txt"), 1), 3);
-  EXPECT_EQ(opensq(9, dir.path(), 1), 3);  // a directory is not a file
-  EXPECT_EQ(opensq(9, kUndefined, 1), 3);
-  EXPECT_EQ(opensq(9, "", 2), 1);
-  EXPECT_EQ(opensq(9, "   ", 3), 1);
-  EXPECT_EQ(opensq(9, dir.path(), 2), 1);
-  EXPECT_EQ(opensq(9, dir.file("no/such/dir.txt"), 3), 1);
-  EXPECT_FALSE(isUnitOpen(9));
-  if (test::fileExists("/proc/self/status")) {  // exists, cannot be deleted
-    EXPECT_EQ(opensq(9, "/proc/self/status", 2), 2);
-    EXPECT_FALSE(isUnitOpen(9));
+  struct Case {
+    std::string name;
+    int mode, code;
+  };
+  std::vector<Case> cases = {{dir.file("missing.txt"), 1, 3}, {dir.path(), 1, 3}, {kUndefined, 1, 3}, {"", 2, 1},
+                             {"   ", 3, 1}, {dir.path(), 2, 1}, {dir.file("no/such/dir.txt"), 3, 1}};
+  // A file that exists but cannot be deleted.
+  if (test::fileExists("/proc/self/status")) cases.push_back({"/proc/self/status", 2, 2});
+  for (const Case& c : cases) {
+    EXPECT_EQ(opensq(9, c.name, c.mode), c.code) << c.name << " mode " << c.mode;
+    EXPECT_FALSE(isUnitOpen(9)) << c.name;
   }
 }
 
 TEST_F(SequentialOpen, NegativeModesAndBadModesAreFatal) {
-  const std::string missing = dir.file("missing.dat");
-  const std::string tail = " iomode= 1, err= 3\n Program terminated.\n";
-  EXPECT_EQ(fatalReport([&] { opensq(5, missing, -1); }), " Fatal error in opensq : \n Fichier " + missing + tail);
-  EXPECT_EQ(fatalReport([&] { opensq(5, dir.path(), -3); }),
-            " Fatal error in opensq : \n Fichier " + dir.path() + " iomode= 3, err= 1\n Program terminated.\n");
-  EXPECT_EQ(fatalReport([&] { opensq(5, missing, 4); }),
-            " Fatal error in opensq(" + missing + ") : \n mode=4\n Program terminated.\n");
   // A '%' in the name is printed as it stands; names are cut to 64 characters.
-  const std::string percent = dir.file("50%.dat");
-  EXPECT_EQ(fatalReport([&] { opensq(5, percent, -1); }), " Fatal error in opensq : \n Fichier " + percent + tail);
-  const std::string longName = dir.file(std::string(80, 'n'));
-  EXPECT_EQ(fatalReport([&] { opensq(5, longName, -1); }),
-            " Fatal error in opensq : \n Fichier " + longName.substr(0, 64) + tail);
+  const std::string name = dir.file("50%" + std::string(80, 'n'));
+  EXPECT_EQ(openReport(name, -1),
+            " Fatal error in opensq : \n Fichier " + name.substr(0, 64) + " iomode= 1, err= 3\n Program terminated.\n");
+  EXPECT_EQ(openReport(name, 4), " Fatal error in opensq(" + name.substr(0, 64) + ") : \n mode=4\n Program terminated.\n");
 }
 
 TEST_F(SequentialOpen, FilePresentAndDeleteFile) {
   const std::string name = dir.file("here.dat");
-  writeFile(name, "x");
+  test::writeFile(name, "x");
   EXPECT_TRUE(filePresent(name + "  "));
   EXPECT_FALSE(filePresent(kUndefined));
   EXPECT_EQ(deleteFile("$(" + name), EXPAND_SYNTAX);
   EXPECT_TRUE(test::fileExists(name));
   EXPECT_EQ(deleteFile(name + "   "), EXPAND_OK);
-  EXPECT_FALSE(filePresent(name));
   EXPECT_EQ(deleteFile(name), EXPAND_NOT_FOUND);
 }
 
@@ -121,12 +132,10 @@ TEST_F(SequentialOpen, UnformattedOpening) {
   EXPECT_FALSE(isUnitOpen(6));
   EXPECT_EQ(openUnformatted(6, name, 2), EXPAND_NOT_FOUND);  // created
   EXPECT_EQ(writeRecord(6, "new", 3), kIoOk);
-  EXPECT_EQ(closeUnit(6), kIoOk);
-  EXPECT_EQ(readFile(name), test::framedRecord("new"));
-  EXPECT_EQ(openUnformatted(6, name, 1), EXPAND_OK);
-  char got[3] = {};
+  EXPECT_EQ(openUnformatted(6, name, 1), EXPAND_OK);  // the unit leaves its file first
+  char got[4] = {};
   EXPECT_EQ(readRecord(6, got, 3), kIoOk);
-  EXPECT_EQ(std::string(got, 3), "new");
+  EXPECT_STREQ(got, "new");
   EXPECT_EQ(openUnformatted(6, name, 2), EXPAND_OK);  // replaced
   EXPECT_EQ(closeUnit(6), kIoOk);
   EXPECT_EQ(readFile(name), "");
@@ -135,7 +144,7 @@ TEST_F(SequentialOpen, UnformattedOpening) {
   EXPECT_EQ(openUnformatted(6, "$(PC_H1/x.bin", 2), EXPAND_SYNTAX);
   EXPECT_FALSE(isUnitOpen(6));
   // A good name whose file the system refuses ends the run.
-  EXPECT_EQ(fatalReport([&] { openUnformatted(6, dir.path(), 1); }),
+  EXPECT_EQ(fatalReport(dir, [&] { openUnformatted(6, dir.path(), 1); }),
             " Fatal error in openUnformatted : \n Fichier " + dir.path() + " iomode= 1, err= " +
                 std::to_string(kIoErrorOpen) + "\n Program terminated.\n");
 }
