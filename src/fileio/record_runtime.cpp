@@ -306,7 +306,12 @@ int openUnit(int unit, const std::string& name, OpenDisposition disposition, Fil
   if (unit < 1) return kIoErrorUnit;
   const std::string path = trimTrailingBlanks(name);
   if (path.empty()) return kIoErrorOpen;
-  if (isUnitOpen(unit)) closeUnit(unit);  // a unit opened again leaves its old file first
+  // A unit opened again leaves its old file first; a write error still
+  // pending on that file is reported, not lost with it.
+  if (isUnitOpen(unit)) {
+    const int closed = closeUnit(unit);
+    if (closed != kIoOk) return closed;
+  }
   if (platform::isDirectory(path)) return kIoErrorOpen;
 
   const bool exists = platform::pathExists(path);
