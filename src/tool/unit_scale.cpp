@@ -54,13 +54,14 @@ int unitSystemFromSettings() {
 }
 
 // The number at the front of the first record of the unit's file; `value`
-// is left as it is when the record holds none (or is missing).
+// is left as it is when the record holds none (or is missing). Anything not
+// a finite number counts as none, before it can reach the copy.
 void readFirstReal(int unit, float& value) {
   std::string record;
   if (fileio::readTextRecord(unit, record) != fileio::kIoOk) return;
   std::size_t pos = 0;
   float read = value;
-  if (fileio::readListReal(record, pos, read) == fileio::kListValue) value = read;
+  if (fileio::readListReal(record, pos, read) == fileio::kListValue && std::isfinite(read)) value = read;
 }
 
 // The local scale of the temporary directory, kNoLocalScale when there is
@@ -84,8 +85,7 @@ float localScaleFromFiles() {
     readFirstReal(unit, local);
     fileio::closeUnit(unit);
   }
-  // Anything not a finite number counts as no local scale.
-  return std::isfinite(local) ? local : kNoLocalScale;
+  return local;
 }
 
 void printLocalScaleBanner(float databaseScale, float localScale) {
