@@ -155,9 +155,9 @@ bool parseInteger(std::string_view token, std::int32_t& out) {
   return true;
 }
 
-}  // namespace
-
-int readListReal(std::string_view text, std::size_t& pos, float& value) {
+// The next value of the record through `parse`; a null value leaves `value`.
+template <typename T, typename Parse>
+int readListValue(std::string_view text, std::size_t& pos, T& value, Parse parse) {
   switch (findValue(text, pos)) {
     case Start::End:
       return kListNoValue;
@@ -166,29 +166,21 @@ int readListReal(std::string_view text, std::size_t& pos, float& value) {
     case Start::Value:
       break;
   }
-  const std::string_view token = takeToken(text, pos);
-  float parsed = 0.0f;
-  if (!parseReal(token, parsed)) return kConversionError;
+  T parsed{};
+  if (!parse(takeToken(text, pos), parsed)) return kConversionError;
   value = parsed;
   skipSeparator(text, pos);
   return kListValue;
 }
 
+}  // namespace
+
+int readListReal(std::string_view text, std::size_t& pos, float& value) {
+  return readListValue(text, pos, value, parseReal);
+}
+
 int readListInteger(std::string_view text, std::size_t& pos, std::int32_t& value) {
-  switch (findValue(text, pos)) {
-    case Start::End:
-      return kListNoValue;
-    case Start::Null:
-      return kListValue;
-    case Start::Value:
-      break;
-  }
-  const std::string_view token = takeToken(text, pos);
-  std::int32_t parsed = 0;
-  if (!parseInteger(token, parsed)) return kConversionError;
-  value = parsed;
-  skipSeparator(text, pos);
-  return kListValue;
+  return readListValue(text, pos, value, parseInteger);
 }
 
 std::string formatListReal(float value) {
