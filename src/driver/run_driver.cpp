@@ -77,6 +77,47 @@ RunArray<T> allocateArray(std::int64_t entries) {
   return array;
 }
 
+// The point, Z and contour arrays of the run, sized by the counting pass
+// with ten spare entries each.
+struct RunArrays {
+  std::int32_t pointCapacity = 0;
+  std::int32_t contourCapacity = 0;
+  RunArray<Point> points;
+  RunArray<float> zs;
+  RunArray<ZContour> contours;
+};
+
+RunArrays allocateRunArrays(const ContourCounts& counts) {
+  RunArrays arrays;
+  const std::int64_t pointCapacity = std::int64_t{counts.np} + kSpareEntries;
+  const std::int64_t contourCapacity = std::int64_t{counts.nc} + kSpareEntries;
+  arrays.points = allocateArray<Point>(pointCapacity);
+  arrays.zs = allocateArray<float>(pointCapacity);
+  arrays.contours = allocateArray<ZContour>(contourCapacity);
+  arrays.pointCapacity = static_cast<std::int32_t>(pointCapacity);
+  arrays.contourCapacity = static_cast<std::int32_t>(contourCapacity);
+  return arrays;
+}
+
+// Loads the points and cuts them into checked contours; the number of
+// contours, or 0 when the file could not be used.
+std::int32_t loadContours(RunArrays& arrays) {
+  const std::int32_t entries =
+      loadContourPoints(arrays.points.get(), arrays.zs.get(), arrays.pointCapacity, kDuplicateTolerance);
+  if (entries < 1) return 0;
+  return assembleContours(arrays.points.get(), arrays.zs.get(), entries, arrays.contours.get(),
+                          arrays.contourCapacity, kClosureTolerance);
+}
+
+void writeOutput(RunMode mode, const CheckedArray<Pocket*>& ordered) {
+  switch (mode) {
+    case RunMode::ContourFileRewrite: rewriteContourFile(ordered); break;
+    case RunMode::RecordContourFile: writeRecordContourFile(ordered); break;
+    case RunMode::PocketResultFile: writePocketResultFile(ordered); break;
+    case RunMode::LevelDumpThenRecords: break;  // runs as RecordContourFile after the dump
+  }
+}
+
 void printBanner() {
   std::printf("%s", kStarLine53);
   std::printf("***          POCKET CLASSIFICATION\n");
@@ -171,22 +212,10 @@ int runPocketClassifier(int argc, char** argv) {
   const ContourCounts counts = countContourInfoFile();
   std::printf(" NZ=%d NP=%d NC=%d\n", counts.nz, counts.np, counts.nc);
 
-  const std::int64_t pointCapacity = std::int64_t{counts.np} + kSpareEntries;
-  const std::int64_t contourCapacity = std::int64_t{counts.nc} + kSpareEntries;
-  auto points = allocateArray<Point>(pointCapacity);
-  auto zs = allocateArray<float>(pointCapacity);
-  auto contours = allocateArray<ZContour>(contourCapacity);
+  RunArrays arrays = allocateRunArrays(counts);
   std::printf("\n");
   std::printf(" LOADING Z-CONTOURS...\n");
-
-  const std::int32_t entries = loadContourPoints(points.get(), zs.get(),
-                                                 static_cast<std::int32_t>(pointCapacity), kDuplicateTolerance);
-  if (entries < 1) {
-    std::printf("%s", kLoadError);
-    return 0;
-  }
-  const std::int32_t contourCount = assembleContours(points.get(), zs.get(), entries, contours.get(),
-                                                     static_cast<std::int32_t>(contourCapacity), kClosureTolerance);
+  const std::int32_t contourCount = loadContours(arrays);
   if (contourCount < 1) {
     std::printf("%s", kLoadError);
     return 0;
@@ -195,7 +224,7 @@ int runPocketClassifier(int argc, char** argv) {
   std::printf("\n");
   std::printf(" BUILDING POCKETS IN EACH Z-LEVEL...\n");
 
-  std::vector<ZLevel> levels = groupIntoLevels(contours.get(), contourCount, counts.nz + kSpareEntries);
+  std::vector<ZLevel> levels = groupIntoLevels(arrays.contours.get(), contourCount, counts.nz + kSpareEntries);
   const auto levelCount = static_cast<std::int32_t>(levels.size());
   std::printf(" %d z-levels\n", levelCount);
 
@@ -233,17 +262,10 @@ int runPocketClassifier(int argc, char** argv) {
     return 0;
   }
 
-  switch (mode) {
-    case RunMode::ContourFileRewrite: rewriteContourFile(*ordered); break;
-    case RunMode::RecordContourFile: writeRecordContourFile(*ordered); break;
-    case RunMode::PocketResultFile: writePocketResultFile(*ordered); break;
-    case RunMode::LevelDumpThenRecords: break;  // turned into RecordContourFile above
-  }
+  writeOutput(mode, *ordered);
 
   levels.clear();
-  contours.block.reset();
-  zs.block.reset();
-  points.block.reset();
+  arrays = RunArrays{};
   parameters = ToolParameters{};
 
   removeStaleOffsetError();
