@@ -12,15 +12,10 @@ namespace pc::fileio {
 namespace {
 
 using test::framedRecord;
-using test::readFile;
 
 constexpr int kUnit = 11;
 
-std::string int32Bytes(std::int32_t v) {
-  std::string s;
-  test::putInt32(s, v);
-  return s;
-}
+std::string int32Bytes(std::int32_t v) { std::string s; test::putInt32(s, v); return s; }
 
 class RecordRuntime : public ::testing::Test {
  protected:
@@ -30,13 +25,12 @@ class RecordRuntime : public ::testing::Test {
     ASSERT_EQ(openUnit(kUnit, path, OpenDisposition::Old, form), kIoOk);
   }
   // The next record (or line), or the status of the read when it fails.
-  std::string rec(std::size_t size) {
-    got.assign(size, '?');
-    return shown(readRecord(kUnit, got.data(), size));
-  }
+  std::string rec(std::size_t size) { got.assign(size, '?'); return shown(readRecord(kUnit, got.data(), size)); }
   std::string line() { return shown(readTextRecord(kUnit, got)); }
   std::string shown(int s) const { return s == kIoOk ? got : status(s); }
   static std::string status(int s) { return "status " + std::to_string(s); }
+  // What the unit left in its file.
+  std::string closed() { EXPECT_EQ(closeUnit(kUnit), kIoOk); return test::readFile(path); }
 
   test::TempDir dir;
   std::string path = dir.file("data.bin");
@@ -55,8 +49,7 @@ TEST_F(RecordRuntime, FramingRoundTripThroughTheBuffer) {
   ASSERT_EQ(writeRecord(kUnit, nullptr, 0), kIoOk);
   ASSERT_EQ(writeRecord(kUnit, huge.data(), huge.size()), kIoOk);
   ASSERT_EQ(writeRecord(kUnit, "end", 3), kIoOk);
-  EXPECT_EQ(closeUnit(kUnit), kIoOk);
-  EXPECT_TRUE(readFile(path) == bytes + framedRecord("") + framedRecord(huge) + framedRecord("end"));
+  EXPECT_TRUE(closed() == bytes + framedRecord("") + framedRecord(huge) + framedRecord("end"));
 
   ASSERT_EQ(openUnit(kUnit, path, OpenDisposition::Old, FileForm::Unformatted), kIoOk);
   for (int i = 0; i < 100000; ++i) ASSERT_EQ(rec(4), int32Bytes(i)) << i;
@@ -70,14 +63,13 @@ TEST_F(RecordRuntime, FramingRoundTripThroughTheBuffer) {
 TEST_F(RecordRuntime, DamagedFramingIsAReadErrorThatDoesNotAdvance) {
   const std::string good = framedRecord("0123456789ab");
   const std::pair<std::string, std::size_t> cases[] = {
-      {int32Bytes(12) + "0123456789ab" + int32Bytes(13), 12},   // trailer differs
-      {framedRecord("01234567"), 12},                            // shorter than asked
-      {int32Bytes(INT32_MAX) + std::string(100, 'z'), 12},       // 2 GiB count, small file
-      {int32Bytes(-12) + "0123456789ab" + int32Bytes(-12), 12},  // negative count
-      {good.substr(0, 10), 12},                                  // cut in the data
-      {good.substr(0, good.size() - 1), 12},                     // cut in the trailer
-      {good.substr(0, 3), 0},                                    // cut in the count
-      {int32Bytes(5000000) + std::string(2000000, 'q'), 4},      // huge record cut
+      {int32Bytes(12) + "0123456789ab" + int32Bytes(13), 12},        // trailer differs
+      {framedRecord("01234567"), 12},                                 // shorter than asked
+      {int32Bytes(INT32_MAX) + std::string(100, 'z'), 12},            // 2 GiB count, small file
+      {int32Bytes(-12) + "0123456789ab" + int32Bytes(-12), 12},       // negative count
+      {good.substr(0, good.size() - 1), 12},                          // cut in the trailer
+      {good.substr(0, 3), 0},                                         // cut in the count
+      {int32Bytes(2000000) + std::string(2000000, 'q') + int32Bytes(1999999), 4},  // trailer differs, long record
   };
   for (const auto& [bytes, ask] : cases) {
     SCOPED_TRACE(testing::Message() << bytes.size() << " bytes");
@@ -89,7 +81,7 @@ TEST_F(RecordRuntime, DamagedFramingIsAReadErrorThatDoesNotAdvance) {
   }
 }
 
-TEST_F(RecordRuntime, RewindBackspaceAndAWriteInTheMiddleCutsTheRest) {
+TEST_F(RecordRuntime, PositioningCutsAtAWriteInBothForms) {
   openOld(framedRecord("one") + framedRecord("two") + framedRecord("three"));
   EXPECT_EQ(rec(3), "one");
   EXPECT_EQ(rec(3), "two");
@@ -100,32 +92,8 @@ TEST_F(RecordRuntime, RewindBackspaceAndAWriteInTheMiddleCutsTheRest) {
   EXPECT_EQ(backspaceUnit(kUnit), kIoOk);  // from after the end to the end
   EXPECT_EQ(backspaceUnit(kUnit), kIoOk);
   EXPECT_EQ(rec(1), "2");
-  EXPECT_EQ(closeUnit(kUnit), kIoOk);
-  EXPECT_EQ(readFile(path), framedRecord("one") + framedRecord("2"));
-}
+  EXPECT_EQ(closed(), framedRecord("one") + framedRecord("2"));
 
-TEST_F(RecordRuntime, UnitTableRefusals) {
-  EXPECT_EQ(openUnit(kUnit, dir.file("missing"), OpenDisposition::Old, FileForm::Unformatted), kIoErrorOpen);
-  EXPECT_EQ(openUnit(0, path, OpenDisposition::Unknown, FileForm::Formatted), kIoErrorUnit);
-  test::writeFile(path, "keep");
-  EXPECT_TRUE(namedFileExists(path + "  "));  // a blank-padded name
-  EXPECT_EQ(openUnit(kUnit, path, OpenDisposition::New, FileForm::Formatted), kIoErrorOpen);
-  EXPECT_EQ(rec(1), status(kIoErrorUnit));
-  EXPECT_EQ(closeUnit(kUnit), kIoOk);  // closing a closed unit is harmless
-  EXPECT_EQ(readFile(path), "keep");
-}
-
-TEST_F(RecordRuntime, WriteFailureIsReportedAtTheLatestOnClose) {
-  if (!test::fileExists("/dev/full")) GTEST_SKIP() << "no /dev/full here";
-  ASSERT_EQ(openUnit(kUnit, "/dev/full", OpenDisposition::Old, FileForm::Unformatted), kIoOk);
-  EXPECT_EQ(writeRecord(kUnit, "abc", 3), kIoOk);  // still in the buffer
-  EXPECT_EQ(closeUnit(kUnit), kIoErrorSystem);
-  ASSERT_EQ(openUnit(kUnit, "/dev/full", OpenDisposition::Old, FileForm::Formatted), kIoOk);
-  EXPECT_EQ(writeTextRecord(kUnit, std::string(2 * 1024 * 1024, 'l')), kIoErrorSystem);  // beyond the buffer
-  EXPECT_EQ(closeUnit(kUnit), kIoErrorSystem);
-}
-
-TEST_F(RecordRuntime, TextRecordsBackspaceAndAppend) {
   openOld("first\r\n\n  x , y\nlast", FileForm::Formatted);
   EXPECT_EQ(rec(1), status(kIoErrorUnit));  // the form must match the operation
   EXPECT_EQ(writeRecord(kUnit, "x", 1), kIoErrorUnit);
@@ -133,8 +101,7 @@ TEST_F(RecordRuntime, TextRecordsBackspaceAndAppend) {
   EXPECT_EQ(line(), status(kIoEnd));
   EXPECT_EQ(backspaceUnit(kUnit), kIoOk);             // back to the end of the data
   EXPECT_EQ(writeTextRecord(kUnit, "added"), kIoOk);  // after an unterminated last line
-  EXPECT_EQ(closeUnit(kUnit), kIoOk);
-  EXPECT_EQ(readFile(path), "first\r\n\n  x , y\nlast\nadded\n");
+  EXPECT_EQ(closed(), "first\r\n\n  x , y\nlast\nadded\n");
 
   openOld("a\nbb\n\nccc\n" + std::string(kMaxTextRecord + 1, 'L') + "\n", FileForm::Formatted);
   for (const char* expected : {"a", "bb", "", "ccc"}) EXPECT_EQ(line(), expected);
@@ -144,8 +111,26 @@ TEST_F(RecordRuntime, TextRecordsBackspaceAndAppend) {
   for (int i = 0; i < 3; ++i) ASSERT_EQ(backspaceUnit(kUnit), kIoOk);  // stops at the start
   EXPECT_EQ(line(), "a");
   EXPECT_EQ(writeTextRecord(kUnit, "B"), kIoOk);
-  EXPECT_EQ(closeUnit(kUnit), kIoOk);
-  EXPECT_EQ(readFile(path), "a\nB\n");
+  EXPECT_EQ(closed(), "a\nB\n");
+}
+
+TEST_F(RecordRuntime, RefusalsAndWriteFailures) {
+  EXPECT_EQ(openUnit(kUnit, dir.file("missing"), OpenDisposition::Old, FileForm::Unformatted), kIoErrorOpen);
+  EXPECT_EQ(openUnit(0, path, OpenDisposition::Unknown, FileForm::Formatted), kIoErrorUnit);
+  test::writeFile(path, "keep");
+  EXPECT_TRUE(namedFileExists(path + "  "));  // a blank-padded name
+  EXPECT_EQ(openUnit(kUnit, path, OpenDisposition::New, FileForm::Formatted), kIoErrorOpen);
+  EXPECT_EQ(rec(1), status(kIoErrorUnit));
+  EXPECT_EQ(closed(), "keep");  // closing a closed unit is harmless
+
+  // A write failure is reported at the latest on close.
+  if (!test::fileExists("/dev/full")) GTEST_SKIP() << "no /dev/full here";
+  ASSERT_EQ(openUnit(kUnit, "/dev/full", OpenDisposition::Old, FileForm::Unformatted), kIoOk);
+  EXPECT_EQ(writeRecord(kUnit, "abc", 3), kIoOk);  // still in the buffer
+  EXPECT_EQ(closeUnit(kUnit), kIoErrorSystem);
+  ASSERT_EQ(openUnit(kUnit, "/dev/full", OpenDisposition::Old, FileForm::Formatted), kIoOk);
+  EXPECT_EQ(writeTextRecord(kUnit, std::string(2 * 1024 * 1024, 'l')), kIoErrorSystem);  // beyond the buffer
+  EXPECT_EQ(closeUnit(kUnit), kIoErrorSystem);
 }
 
 }  // namespace

@@ -4,7 +4,6 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
-#include <cstdlib>
 #include <string>
 #include <tuple>
 #include <vector>
@@ -24,22 +23,16 @@ using test::readFile;
 template <typename F>
 std::string fatalReport(const test::TempDir& dir, F call) {
   const std::string out = dir.file("report.txt");
-  EXPECT_EXIT(
-      {
-        if (!std::freopen(out.c_str(), "w", stdout)) std::abort();
-        call();
-      },
-      ::testing::ExitedWithCode(kFatalStopStatus), "");
+  EXPECT_EXIT({ if (std::freopen(out.c_str(), "w", stdout)) call(); }, ::testing::ExitedWithCode(kFatalStopStatus), "");
   return readFile(out);
 }
 
 TEST(RuntimeFatal, MessageText) {
   const std::tuple<std::string, std::vector<int>, std::string> cases[] = {
       // Values take exactly the characters they need, nine at most.
-      {" iomode= %, err= %", {2, 5}, " iomode= 2, err= 5"}, {"v=%;", {-12}, "v=-12;"}, {"%%", {1, 2}, "12"},
-      {"%", {123456789}, "123456789"}, {"[%]", {1234567890}, "[*********]"},
-      // Template blanks are kept; a '%' without a value stays.
-      {"  a %  ", {7}, "  a 7  "}, {"a=% b=%", {1}, "a=1 b=%"},
+      {"%%", {1, 2}, "12"}, {"%", {123456789}, "123456789"}, {"[%]", {1234567890}, "[*********]"},
+      // The text around the marks, blanks included, is kept; a '%' without a value stays.
+      {"  a %  ", {7}, "  a 7  "}, {"a=% b=%", {1}, "a=1 b=%"}, {"v=%;", {-12}, "v=-12;"},
       // Beyond 198 characters the framing parenthesis goes, and one character more.
       {std::string(198, 'x'), {}, std::string(198, 'x')}, {std::string(250, 'x'), {}, std::string(198, 'x')},
       // A value growing the field pushes its end out.
@@ -63,9 +56,6 @@ class SequentialOpen : public ::testing::Test {
     closeAllUnits();
     setConfigurationLookup(previousLookup);
   }
-  std::string openReport(const std::string& name, int mode) {
-    return fatalReport(dir, [&] { opensq(5, name, mode); });
-  }
 
   test::TempDir dir;
   ConfigurationLookup previousLookup = nullptr;
@@ -74,7 +64,6 @@ class SequentialOpen : public ::testing::Test {
 TEST_F(SequentialOpen, ModesAndTheLowestFreeUnit) {
   const std::string name = dir.file("f.txt");
   test::writeFile(name, "old\nmore\n");
-  EXPECT_EQ(freeUnit(), 3);
   ASSERT_EQ(opensq(3, name + "    ", 1), 0);  // a blank-padded field
   ASSERT_EQ(opensq(4, dir.file("b"), 2), 0);
   EXPECT_EQ(freeUnit(), 5);
@@ -92,7 +81,7 @@ TEST_F(SequentialOpen, ModesAndTheLowestFreeUnit) {
   EXPECT_EQ(readFile(name), "one\ntwo\n");
 }
 
-TEST_F(SequentialOpen, FailuresGiveTheirCodeAndLeaveTheUnitClosed) {
+TEST_F(SequentialOpen, FailuresGiveTheirCodeOrEndTheRun) {
   struct Case {
     std::string name;
     int mode, code;
@@ -105,37 +94,23 @@ TEST_F(SequentialOpen, FailuresGiveTheirCodeAndLeaveTheUnitClosed) {
     EXPECT_EQ(opensq(9, c.name, c.mode), c.code) << c.name << " mode " << c.mode;
     EXPECT_FALSE(isUnitOpen(9)) << c.name;
   }
-}
-
-TEST_F(SequentialOpen, NegativeModesAndBadModesAreFatal) {
-  // A '%' in the name is printed as it stands; names are cut to 64 characters.
+  // Negative modes and bad modes are fatal. A '%' in the name is printed as
+  // it stands; names are cut to 64 characters.
   const std::string name = dir.file("50%" + std::string(80, 'n'));
-  EXPECT_EQ(openReport(name, -1),
+  EXPECT_EQ(fatalReport(dir, [&] { opensq(5, name, -1); }),
             " Fatal error in opensq : \n Fichier " + name.substr(0, 64) + " iomode= 1, err= 3\n Program terminated.\n");
-  EXPECT_EQ(openReport(name, 4), " Fatal error in opensq(" + name.substr(0, 64) + ") : \n mode=4\n Program terminated.\n");
+  EXPECT_EQ(fatalReport(dir, [&] { opensq(5, name, 4); }),
+            " Fatal error in opensq(" + name.substr(0, 64) + ") : \n mode=4\n Program terminated.\n");
 }
 
-TEST_F(SequentialOpen, FilePresentAndDeleteFile) {
-  const std::string name = dir.file("here.dat");
-  test::writeFile(name, "x");
-  EXPECT_TRUE(filePresent(name + "  "));
-  EXPECT_FALSE(filePresent(kUndefined));
-  EXPECT_EQ(deleteFile("$(" + name), EXPAND_SYNTAX);
-  EXPECT_TRUE(test::fileExists(name));
-  EXPECT_EQ(deleteFile(name + "   "), EXPAND_OK);
-  EXPECT_EQ(deleteFile(name), EXPAND_NOT_FOUND);
-}
-
-TEST_F(SequentialOpen, UnformattedOpening) {
+TEST_F(SequentialOpen, UnformattedOpeningAndDeleting) {
   const std::string name = dir.file("contour.bin");
   EXPECT_EQ(openUnformatted(6, name, 1), EXPAND_NOT_FOUND);
-  EXPECT_FALSE(isUnitOpen(6));
   EXPECT_EQ(openUnformatted(6, name, 2), EXPAND_NOT_FOUND);  // created
   EXPECT_EQ(writeRecord(6, "new", 3), kIoOk);
   EXPECT_EQ(openUnformatted(6, name, 1), EXPAND_OK);  // the unit leaves its file first
-  char got[4] = {};
-  EXPECT_EQ(readRecord(6, got, 3), kIoOk);
-  EXPECT_STREQ(got, "new");
+  EXPECT_EQ(readFile(name), test::framedRecord("new"));
+  EXPECT_TRUE(filePresent(name + "  "));
   EXPECT_EQ(openUnformatted(6, name, 2), EXPAND_OK);  // replaced
   EXPECT_EQ(closeUnit(6), kIoOk);
   EXPECT_EQ(readFile(name), "");
@@ -147,6 +122,11 @@ TEST_F(SequentialOpen, UnformattedOpening) {
   EXPECT_EQ(fatalReport(dir, [&] { openUnformatted(6, dir.path(), 1); }),
             " Fatal error in openUnformatted : \n Fichier " + dir.path() + " iomode= 1, err= " +
                 std::to_string(kIoErrorOpen) + "\n Program terminated.\n");
+  EXPECT_EQ(deleteFile("$(" + name), EXPAND_SYNTAX);
+  EXPECT_TRUE(test::fileExists(name));
+  EXPECT_EQ(deleteFile(name + "   "), EXPAND_OK);
+  EXPECT_EQ(deleteFile(name), EXPAND_NOT_FOUND);
+  EXPECT_FALSE(filePresent(name) || filePresent(kUndefined));
 }
 
 }  // namespace
