@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <climits>
-#include <string>
 #include <tuple>
 #include <utility>
 
@@ -12,50 +11,58 @@
 namespace pc {
 namespace {
 
-using Line = std::pair<std::string, int>;
+using Opened = std::pair<int, int>;         // handle, status
+using Line = std::pair<std::string, int>;  // buffer, status
 
-Line readLine(int handle, std::size_t width) {
-  std::string buffer(width, '?');
-  int status = 99;
-  lineFileReadLine(handle, buffer, status);
-  return {buffer, status};
+Opened openFile(const std::string& name, int mode) {
+  Opened result{7, 99};
+  lineFileOpen(result.first, name, mode, result.second);
+  return result;
 }
 
-TEST(LineFileTable, OpenAndCloseFailures) {
+int closeFile(int handle) {
+  int status = 99;
+  lineFileClose(handle, status);
+  return status;
+}
+
+Line readLine(int handle, std::size_t width) {
+  Line result{std::string(width, '?'), 99};
+  lineFileReadLine(handle, result.first, result.second);
+  return result;
+}
+
+TEST(LineFileTable, OpenCloseHandlesAndLineStatuses) {
   test::TempDir dir;
-  const std::tuple<std::string, int, int> cases[] = {
-      {"a", 4, kLineBadMode},           {"a", -4, kLineBadMode},     {"a", INT_MIN, kLineBadMode},
-      {"missing", 1, kLineIoError},     {"no/dir", -2, kLineCreateFailed},
-      {std::string("x\0y", 3), 2, kLineCreateFailed}};
-  for (const auto& [name, mode, expected] : cases) {
-    int handle = 7;
-    int status = 0;
-    lineFileOpen(handle, dir.file(name), mode, status);
-    EXPECT_EQ(status, expected) << mode;
-    EXPECT_EQ(handle, -1) << mode;
-  }
+  const std::tuple<std::string, int, int> failures[] = {
+      {"a", 4, kLineBadMode}, {"a", -4, kLineBadMode}, {"a", INT_MIN, kLineBadMode}, {"missing", 1, kLineIoError},
+      {"no/dir", -2, kLineCreateFailed}, {std::string("x\0y", 3), 2, kLineCreateFailed}};
+  for (const auto& [name, mode, status] : failures) EXPECT_EQ(openFile(dir.file(name), mode), (Opened{-1, status}));
   EXPECT_FALSE(test::fileExists(dir.file("x")));  // not cut at the NUL
 
   // Mode -2 creates; trailing blanks of the name do not count.
-  int handle = -1;
-  int status = 0;
-  lineFileOpen(handle, dir.file("new") + "     ", -2, status);
-  ASSERT_EQ(status, kLineOk);
-  EXPECT_TRUE(test::fileExists(dir.file("new")));
-  lineFileClose(handle, status);
-  EXPECT_EQ(status, kLineOk);
-  lineFileClose(handle, status);  // already closed
-  EXPECT_EQ(status, kLineIoError);
+  const auto [created, createStatus] = openFile(dir.file("f") + "     ", -2);
+  ASSERT_EQ(createStatus, kLineOk);
+  EXPECT_TRUE(test::fileExists(dir.file("f")));
+  test::writeFile(dir.file("f"), "keep\n");
+  EXPECT_EQ(closeFile(created), kLineOk);
+  EXPECT_EQ(closeFile(created), kLineIoError);  // already closed
   EXPECT_EQ(readLine(-1, 3), (Line{"   ", kLineIoError}));
-}
 
-TEST(LineFileTable, LineStatuses) {
-  test::TempDir dir;
+  // Handles are the lowest free entries. A full table refuses without
+  // touching the file, even in "w+b".
+  for (int i = 0; i < kLineFileSlots; ++i) ASSERT_EQ(openFile(dir.file("f"), 1).first, i);
+  EXPECT_EQ(openFile(dir.file("f"), 2), (Opened{-1, kLineCreateFailed}));
+  EXPECT_EQ(openFile(dir.file("f"), 1), (Opened{-1, kLineIoError}));
+  EXPECT_EQ(test::readFile(dir.file("f")), "keep\n");
+  EXPECT_EQ(closeFile(42), kLineOk);
+  EXPECT_EQ(openFile(dir.file("f"), 1), (Opened{42, kLineOk}));
+  for (int i = 0; i < kLineFileSlots; ++i) closeFile(i);
+
+  // Every status of a line read.
   test::writeFile(dir.file("f"), "ab\r\r\ncd\n\n" + std::string(1022, 'x') + "\n" + std::string(1030, 'y') +
                                      "\nxyz");
-  int handle = -1;
-  int status = 0;
-  lineFileOpen(handle, dir.file("f"), 1, status);
+  const auto [handle, status] = openFile(dir.file("f"), 1);
   ASSERT_EQ(status, kLineOk);
   EXPECT_EQ(readLine(handle, 4), (Line{"ab  ", kLineOk}));
   EXPECT_EQ(readLine(handle, 1), (Line{"c", kLineOk}));  // cut to the buffer
@@ -65,38 +72,13 @@ TEST(LineFileTable, LineStatuses) {
   EXPECT_EQ(readLine(handle, 10), (Line{"yyyyyyy   ", kLineOk}));  // the rest of that line
   EXPECT_EQ(readLine(handle, 5), (Line{"xyz  ", kLinePartial}));
   EXPECT_EQ(readLine(handle, 5), (Line{"     ", kLineEnd}));
-  lineFileClose(handle, status);
+  closeFile(handle);
 
   // A directory opens on some systems but cannot be read as lines.
-  lineFileOpen(handle, dir.path(), 1, status);
-  if (status == kLineOk) {
-    EXPECT_EQ(readLine(handle, 2).second, kLineIoError);
-    lineFileClose(handle, status);
+  if (const auto [h, s] = openFile(dir.path(), 1); s == kLineOk) {
+    EXPECT_EQ(readLine(h, 2).second, kLineIoError);
+    closeFile(h);
   }
-}
-
-TEST(LineFileTable, HandlesAreTheLowestFreeEntries) {
-  test::TempDir dir;
-  test::writeFile(dir.file("f"), "keep\n");
-  int status = 0;
-  for (int i = 0; i < kLineFileSlots; ++i) {
-    int h = -1;
-    lineFileOpen(h, dir.file("f"), 1, status);
-    ASSERT_EQ(h, i);
-  }
-  // A full table refuses without touching the file, even in "w+b".
-  int h = 5;
-  lineFileOpen(h, dir.file("f"), 2, status);
-  EXPECT_EQ(status, kLineCreateFailed);
-  EXPECT_EQ(h, -1);
-  lineFileOpen(h, dir.file("f"), 1, status);
-  EXPECT_EQ(status, kLineIoError);
-  EXPECT_EQ(test::readFile(dir.file("f")), "keep\n");
-
-  lineFileClose(42, status);
-  lineFileOpen(h, dir.file("f"), 1, status);
-  EXPECT_EQ(h, 42);
-  for (int i = 0; i < kLineFileSlots; ++i) lineFileClose(i, status);
 }
 
 }  // namespace

@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <string>
 #include <tuple>
 
 #include "support/test_support.h"
@@ -12,46 +11,16 @@ namespace {
 
 using Strings = std::map<std::string, std::string>;
 
-TEST(ProgramVersion, BuiltExecutables) {
-  Strings strings;
-  FixedVersionInfo fixed;
-  ASSERT_EQ(readVersionInfo(PC_VERSION_FIXTURE_3_2, strings, fixed), kVersionOk);
-  EXPECT_EQ(std::tie(fixed.signature, fixed.fileVersionHigh, fixed.productVersionHigh, fixed.productVersionLow,
-                     fixed.fileType),
-            std::make_tuple(0xFEEF04BDu, 196610u, 196610u, (7u << 16) | 9u, 1u));
-  const std::string prefix = "\\StringFileInfo\\040904b0\\";
-  EXPECT_EQ(strings[prefix + "ProductVersion"], "3.2.7.9");
-  EXPECT_EQ(strings[prefix + "FileVersion"], "3.2.7.9");
-  EXPECT_EQ(strings[prefix + "FileDescription"], "Fixture \"three\\two\"");
-  EXPECT_EQ(strings[prefix + "InternalName"], "pc_version_fixture_3_2");
-  EXPECT_EQ(strings.size(), 6u);
-
-  ASSERT_EQ(readVersionInfo(PC_VERSION_FIXTURE_ZERO, strings, fixed), kVersionOk);
-  EXPECT_EQ(fixed.productVersionHigh, 0u);
-  EXPECT_EQ(strings[prefix + "ProductVersion"], "0.0.0.0");
-
-  fixed.productVersionHigh = 77;
-  EXPECT_EQ(readVersionInfo(PC_VERSION_FIXTURE_NONE, strings, fixed), kVersionMissing);
-  EXPECT_EQ(fixed.productVersionHigh, 0u);
-  EXPECT_TRUE(strings.empty());
-
-  // The running test program carries 7.5.0.1.
-  EXPECT_EQ(readVersionInfo(nullptr, strings, fixed), kVersionOk);
-  EXPECT_EQ(programVersion(), 7u * 65536u + 5u);
-}
-
 // A minimal ELF file: header, section names, version section, then the table
 // of three section headers (null, names, version).
 struct Elf {
   bool wide, big;
+  std::size_t entry = wide ? 64 : 40, table = 0;
   std::string bytes;
-  std::size_t entry = wide ? 64 : 40;
-  std::size_t table = 0;
 
   void put(std::size_t at, std::uint64_t v, int n) {
     for (int i = 0; i < n; ++i) bytes[at + i] = static_cast<char>(v >> 8 * (big ? n - 1 - i : i));
   }
-  std::size_t versionHeader() const { return table + 2 * entry; }
 
   Elf(bool w, bool b) : wide(w), big(b) {
     const std::size_t header = wide ? 64 : 52, versionAt = header + 22;
@@ -60,9 +29,8 @@ struct Elf {
     bytes.assign(table + 3 * entry, '\0');
     bytes.replace(0, 7, std::string("\x7f" "ELF") + char(wide ? 2 : 1) + char(big ? 2 : 1) + '\1');
     put(wide ? 40 : 32, table, wide ? 8 : 4);
-    put(wide ? 58 : 46, entry, 2);
-    put(wide ? 60 : 48, 3, 2);
-    put(wide ? 62 : 50, 1, 2);
+    const std::size_t counts[3] = {entry, 3, 1};  // entry size, entries, index of the names
+    for (int i = 0; i < 3; ++i) put((wide ? 58 : 46) + 2 * i, counts[i], 2);
     bytes.replace(header, 22, std::string("\0.shstrtab\0.pcversion\0", 22));
     put(versionAt, 0xFEEF04BD, 4);
     put(versionAt + 16, 0x30002, 4);
@@ -79,23 +47,41 @@ struct Elf {
   }
 };
 
-class ElfFiles : public testing::Test {
- protected:
-  test::TempDir dir;
+TEST(ProgramVersion, BuiltAndDamagedExecutables) {
   Strings strings;
   FixedVersionInfo fixed;
-  int readBytes(const std::string& bytes) {
+  ASSERT_EQ(readVersionInfo(PC_VERSION_FIXTURE_3_2, strings, fixed), kVersionOk);
+  EXPECT_EQ(std::tie(fixed.signature, fixed.fileVersionHigh, fixed.productVersionHigh, fixed.productVersionLow,
+                     fixed.fileType),
+            std::make_tuple(0xFEEF04BDu, 196610u, 196610u, (7u << 16) | 9u, 1u));
+  const std::string p = "\\StringFileInfo\\040904b0\\", name = "pc_version_fixture_3_2";
+  EXPECT_EQ(strings, (Strings{{p + "FileDescription", "Fixture \"three\\two\""}, {p + "FileVersion", "3.2.7.9"},
+                              {p + "InternalName", name}, {p + "OriginalFilename", name},
+                              {p + "ProductName", "PocketClassifier"}, {p + "ProductVersion", "3.2.7.9"}}));
+
+  ASSERT_EQ(readVersionInfo(PC_VERSION_FIXTURE_ZERO, strings, fixed), kVersionOk);
+  EXPECT_EQ(fixed.productVersionHigh, 0u);
+  EXPECT_EQ(strings[p + "ProductVersion"], "0.0.0.0");
+
+  fixed.productVersionHigh = 77;
+  EXPECT_EQ(readVersionInfo(PC_VERSION_FIXTURE_NONE, strings, fixed), kVersionMissing);
+  EXPECT_EQ(std::pair(fixed.productVersionHigh, strings.size()), std::pair(0u, std::size_t{0}));
+
+  // The running test program carries 7.5.0.1.
+  EXPECT_EQ(readVersionInfo(nullptr, strings, fixed), kVersionOk);
+  EXPECT_EQ(programVersion(), 7u * 65536u + 5u);
+
+  // Both word sizes and byte orders of a minimal file, then damaged ones.
+  test::TempDir dir;
+  const auto readBytes = [&](const std::string& bytes) {
     test::writeFile(dir.file("exe"), bytes);
     return readVersionInfo(dir.file("exe").c_str(), strings, fixed);
-  }
-};
-
-TEST_F(ElfFiles, ReadOrRejected) {
+  };
   for (const bool wide : {false, true}) {
     for (const bool big : {false, true}) {
       ASSERT_EQ(readBytes(Elf(wide, big).bytes), kVersionOk) << wide << big;
       EXPECT_EQ(fixed.productVersionHigh, 0x30002u);
-      EXPECT_EQ(strings, (Strings{{"\\StringFileInfo\\040904b0\\ProductName", "Fixture"}}));
+      EXPECT_EQ(strings, (Strings{{p + "ProductName", "Fixture"}}));
     }
   }
   const Elf good(true, false);
@@ -107,7 +93,7 @@ TEST_F(ElfFiles, ReadOrRejected) {
   }
 
   // Offset, value and width of the damage, and the answer.
-  const std::size_t names = good.table + good.entry, version = good.versionHeader();
+  const std::size_t names = good.table + good.entry, version = names + good.entry;
   const std::tuple<std::size_t, std::uint64_t, int, int> damage[] = {
       {40, 0xFFFFFFFFFFFFFFF0ull, 8, kVersionNotElf},         // table offset
       {60, 0xFFFF, 2, kVersionNotElf},                        // section count

@@ -7,7 +7,6 @@
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
-#include <optional>
 #include <thread>
 
 #include "platform/platform.h"
@@ -17,104 +16,89 @@ namespace pc::zonedb {
 namespace {
 
 namespace fs = std::filesystem;
-using namespace std::string_literals;
+using namespace std::chrono_literals;
 
-const std::string kForeign = "999999999\0"s;
-std::string ownContent() { return std::to_string(platform::processId()) + '\0'; }
+const std::string kForeign("999999999\0", 10);
 
 int childStatus(pid_t pid) {
   int status = 0;
-  if (pid < 0 || ::waitpid(pid, &status, 0) != pid || !WIFEXITED(status)) return -1;
-  return WEXITSTATUS(status);
+  return pid > 0 && ::waitpid(pid, &status, 0) == pid && WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
 // A clock that moves only when the lock sleeps; during the first
 // `touchedPolls_` polls the holder touches the lock file each time.
 class ZoneLockTest : public testing::Test {
  protected:
-  ZoneLock acquire(const std::string& name) {
+  ZoneLock acquire() {
     sleeps_ = 0;
-    return acquireZoneLock(name, {[this] { return now_; }, [this](unsigned ms) {
-                                    EXPECT_EQ(ms, 200u);
-                                    now_ += ms;
-                                    if (++sleeps_ < touchedPolls_) {
-                                      fs::last_write_time(lock_, fs::file_time_type::clock::now() +
-                                                                     std::chrono::seconds(sleeps_));
-                                    }
-                                  }});
+    const auto sleep = [this](unsigned ms) {
+      EXPECT_EQ(ms, 200u);
+      now_ += ms;
+      if (++sleeps_ < touchedPolls_) fs::last_write_time(lock_, fs::file_time_type::clock::now() + sleeps_ * 1s);
+    };
+    return acquireZoneLock(lock_, {[this] { return now_; }, sleep});
   }
 
   test::TempDir dir_;
   std::string lock_ = dir_.file("zone.lck");
   std::int64_t now_ = 1000;
-  int sleeps_ = 0;
-  int touchedPolls_ = 0;
+  int sleeps_ = 0, touchedPolls_ = 0;
 };
 
-TEST_F(ZoneLockTest, FreshLockHoldsTheProcessNumberAndIsReleased) {
-  const ZoneLock lock = acquire(lock_);
-  EXPECT_EQ(lock.state, kLockTaken);
-  EXPECT_EQ(sleeps_, 0);
-  EXPECT_EQ(test::readFile(lock_), ownContent());
-  EXPECT_EQ(fs::status(lock_).permissions(), fs::perms::owner_read | fs::perms::owner_write);
-  ASSERT_NE(lock.token, 0);
-  EXPECT_EQ(lock.token, platform::modificationTime(lock_).value());
-
-  fs::last_write_time(lock_, fs::last_write_time(lock_) + std::chrono::seconds(5));
-  EXPECT_TRUE(zoneLockValid(lock_, lock.token));
-  fs::last_write_time(lock_, fs::last_write_time(lock_) + std::chrono::seconds(1));
-  EXPECT_FALSE(zoneLockValid(lock_, lock.token));
-
-  EXPECT_EQ(releaseZoneLock(lock_), kLockRemoved);
-  EXPECT_FALSE(test::fileExists(lock_));
-  EXPECT_FALSE(zoneLockValid(lock_, lock.token));
-  EXPECT_EQ(releaseZoneLock(lock_), kLockNotRemoved);
-}
-
-TEST_F(ZoneLockTest, WaitsForLiveHoldersAndBreaksAbandonedLocks) {
-  const std::string own = std::to_string(platform::processId()) + "\n";
-  const struct {
-    std::optional<std::string> content;  // nullopt: a directory in the way
-    int touchedPolls;
-    int state;
-    int sleeps;
-  } cases[] = {
-      {own, 0, kLockTaken, 0},  // ours already: taken at once and not rewritten
-      {kForeign, 0, kLockBroken, 50},  // untouched for 10 s
-      {"garbage\xff", 0, kLockBroken, 50},
-      {"", 0, kLockBroken, 50},
+TEST_F(ZoneLockTest, TakenAtOnceOrAfterWaitingForLiveHolders) {
+  const std::string pid = std::to_string(platform::processId()), own = pid + "\n", written = pid + '\0';
+  // Lock file content (none yet), polls during which its holder touches it,
+  // then the state and the number of polls of the acquisition.
+  const std::tuple<std::optional<std::string>, int, int, int> cases[] = {
+      {std::nullopt, 0, kLockTaken, 0},
+      {own, 0, kLockTaken, 0},           // ours already: taken at once and not rewritten
       {kForeign, 100, kLockBroken, 149},  // waited for while touched, broken 10 s after the last touch
-      {std::nullopt, 0, kLockGivenUp, 50},  // neither readable nor removable as a file
+      {kForeign, 0, kLockBroken, 50},     // untouched for 10 s
   };
-  for (const auto& c : cases) {
-    if (c.content) test::writeFile(lock_, *c.content);
-    else fs::create_directory(lock_);
-    touchedPolls_ = c.touchedPolls;
-    const ZoneLock lock = acquire(lock_);
-    EXPECT_EQ(lock.state, c.state) << &c - cases;
-    EXPECT_EQ(sleeps_, c.sleeps) << &c - cases;
-    EXPECT_EQ(lock.token != 0, c.state != kLockGivenUp);
-    if (lock.token == 0) continue;
-    EXPECT_EQ(test::readFile(lock_), c.content == own ? own : ownContent());
+  for (const auto& [content, touchedPolls, state, sleeps] : cases) {
+    if (content) test::writeFile(lock_, *content);
+    touchedPolls_ = touchedPolls;
+    const ZoneLock lock = acquire();
+    EXPECT_EQ(std::tuple(lock.state, sleeps_), std::tuple(state, sleeps)) << content.value_or("(none)");
+    EXPECT_EQ(lock.token, platform::modificationTime(lock_).value());
+    EXPECT_EQ(test::readFile(lock_), content == own ? own : written);
     EXPECT_EQ(releaseZoneLock(lock_), kLockRemoved);
   }
+
+  // A new lock is for its owner only, and valid while the file is less
+  // than 6 s newer than the token.
+  const ZoneLock lock = acquire();
+  EXPECT_EQ(fs::status(lock_).permissions(), fs::perms::owner_read | fs::perms::owner_write);
+  fs::last_write_time(lock_, fs::last_write_time(lock_) + 5s);
+  EXPECT_TRUE(zoneLockValid(lock_, lock.token));
+  fs::last_write_time(lock_, fs::last_write_time(lock_) + 1s);
+  EXPECT_FALSE(zoneLockValid(lock_, lock.token));
+  EXPECT_EQ(releaseZoneLock(lock_), kLockRemoved);
+  EXPECT_FALSE(zoneLockValid(lock_, lock.token));
+  EXPECT_EQ(releaseZoneLock(lock_), kLockNotRemoved);
+
+  // A directory in the way can be neither read nor removed as a file.
+  fs::create_directory(lock_);
+  const ZoneLock refused = acquire();
+  EXPECT_EQ(std::tuple(refused.state, refused.token, sleeps_), std::tuple(kLockGivenUp, 0, 50));
   EXPECT_TRUE(fs::is_directory(lock_));
 }
 
-TEST(ZoneLockContent, ProcessNumberParsing) {
+TEST_F(ZoneLockTest, OwnLockByProcessNumberAndReleaseByTheBareName) {
+  using namespace std::string_literals;
   for (const std::string& yes : {"123"s, "0000123"s, "123 \n"s, "123\0junk"s}) EXPECT_TRUE(lockHeldBy(yes, 123));
   for (const char* no : {"1234", "12", "123x", " 123", "", "00000000000000000000123"}) {
     EXPECT_FALSE(lockHeldBy(no, 123)) << no;
   }
-}
 
-TEST_F(ZoneLockTest, ReleaseFallsBackToTheBareNameOnlyForOurOwnLock) {
+  // When the zone's directory is gone, only a lock of our own is removed
+  // under its bare name.
   const auto previous = fs::current_path();
   fs::current_path(dir_.path());
   test::writeFile("zone.lck", kForeign);
   EXPECT_EQ(releaseZoneLock("gone/zone.lck"), kLockNotRemoved);
   EXPECT_TRUE(test::fileExists("zone.lck"));
-  test::writeFile("zone.lck", ownContent());
+  test::writeFile("zone.lck", std::to_string(platform::processId()));
   EXPECT_EQ(releaseZoneLock("gone/zone.lck"), kLockRemoved);
   EXPECT_FALSE(test::fileExists("zone.lck"));
   fs::current_path(previous);
@@ -129,10 +113,10 @@ TEST_F(ZoneLockTest, TwoProcessesNeverHoldTheLockTogether) {
       if (acquireZoneLock(lock_).token == 0) return 3;
       if (test::fileExists(inside)) return 4;
       test::writeFile(inside, "");
-      std::this_thread::sleep_for(std::chrono::milliseconds(60));
+      std::this_thread::sleep_for(60ms);
       fs::remove(inside);
       if (releaseZoneLock(lock_) != kLockRemoved) return 5;
-      std::this_thread::sleep_for(std::chrono::milliseconds(10));
+      std::this_thread::sleep_for(10ms);
     }
     return 0;
   };
@@ -140,24 +124,21 @@ TEST_F(ZoneLockTest, TwoProcessesNeverHoldTheLockTogether) {
   const pid_t child = ::fork();
   const int failure = contend();
   if (child == 0) ::_exit(failure);
-  EXPECT_EQ(failure, 0);
-  EXPECT_EQ(childStatus(child), 0);
+  EXPECT_EQ(std::pair(failure, childStatus(child)), std::pair(0, 0));
   EXPECT_FALSE(test::fileExists(lock_));
 }
 
-TEST_F(ZoneLockTest, LockStillHeldAtExitIsRemovedWhenStillOurs) {
-  for (const int how : {0, 1, 2}) {
-    fs::remove(lock_);
+TEST_F(ZoneLockTest, LockStillHeldAtExitIsRemovedOnlyWhenStillOurs) {
+  for (const bool takenOver : {false, true}) {
     std::fflush(nullptr);
     const pid_t child = ::fork();
     if (child == 0) {
       if (acquireZoneLock(lock_).token == 0) ::_exit(3);
-      if (how == 1) ::_exit(0);  // no exit handlers: the lock stays behind
-      if (how == 2) test::writeFile(lock_, kForeign);  // taken over by another process
+      if (takenOver) test::writeFile(lock_, kForeign);
       std::exit(0);
     }
     EXPECT_EQ(childStatus(child), 0);
-    EXPECT_EQ(test::fileExists(lock_), how != 0) << how;
+    EXPECT_EQ(test::fileExists(lock_), takenOver);
   }
   EXPECT_EQ(test::readFile(lock_), kForeign);
 }
