@@ -200,59 +200,35 @@ int RecordFields::nextItem(char type, std::size_t size, const unsigned char*& by
   return 0;
 }
 
+int RecordFields::readFixed(char type, std::uint64_t& raw) {
+  const std::size_t size = itemSize(type);
+  const unsigned char* bytes = nullptr;
+  if (const int status = nextItem(type, size, bytes); status != 0) return status;
+  raw = decodeUnsigned(bytes, size, order_);
+  dataPos_ += size;
+  --itemsLeft_;
+  return 0;
+}
+
 int RecordFields::readChar(char& value) {
-  const unsigned char* bytes = nullptr;
-  if (const int status = nextItem('C', 1, bytes); status != 0) return status;
-  value = static_cast<char>(bytes[0]);
-  dataPos_ += 1;
-  --itemsLeft_;
-  return 0;
-}
-
-int RecordFields::readLogical(bool& value) {
-  const unsigned char* bytes = nullptr;
-  if (const int status = nextItem('L', 1, bytes); status != 0) return status;
-  value = bytes[0] != 0;
-  dataPos_ += 1;
-  --itemsLeft_;
-  return 0;
-}
-
-int RecordFields::readWord(std::int16_t& value) {
-  const unsigned char* bytes = nullptr;
-  if (const int status = nextItem('W', itemSize('W'), bytes); status != 0) return status;
-  value = static_cast<std::int16_t>(decodeUint16(bytes, order_));
-  dataPos_ += 2;
-  --itemsLeft_;
+  std::uint64_t raw = 0;
+  if (const int status = readFixed('C', raw); status != 0) return status;
+  value = static_cast<char>(raw);
   return 0;
 }
 
 int RecordFields::readInteger(std::int32_t& value) {
-  const unsigned char* bytes = nullptr;
-  if (const int status = nextItem('I', itemSize('I'), bytes); status != 0) return status;
-  value = static_cast<std::int32_t>(decodeUint32(bytes, order_));
-  dataPos_ += 4;
-  --itemsLeft_;
+  std::uint64_t raw = 0;
+  if (const int status = readFixed('I', raw); status != 0) return status;
+  value = static_cast<std::int32_t>(static_cast<std::uint32_t>(raw));
   return 0;
 }
 
 int RecordFields::readReal(float& value) {
-  const unsigned char* bytes = nullptr;
-  if (const int status = nextItem('R', itemSize('R'), bytes); status != 0) return status;
-  const std::uint32_t raw = decodeUint32(bytes, order_);
-  std::memcpy(&value, &raw, sizeof value);
-  dataPos_ += 4;
-  --itemsLeft_;
-  return 0;
-}
-
-int RecordFields::readDouble(double& value) {
-  const unsigned char* bytes = nullptr;
-  if (const int status = nextItem('D', itemSize('D'), bytes); status != 0) return status;
-  const std::uint64_t raw = decodeUnsigned(bytes, 8, order_);
-  std::memcpy(&value, &raw, sizeof value);
-  dataPos_ += 8;
-  --itemsLeft_;
+  std::uint64_t raw = 0;
+  if (const int status = readFixed('R', raw); status != 0) return status;
+  const auto bits = static_cast<std::uint32_t>(raw);
+  std::memcpy(&value, &bits, sizeof value);
   return 0;
 }
 

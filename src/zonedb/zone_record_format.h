@@ -69,11 +69,8 @@ class RecordFields {
   std::string_view format() const { return format_; }
 
   int readChar(char& value);
-  int readLogical(bool& value);
-  int readWord(std::int16_t& value);
   int readInteger(std::int32_t& value);
   int readReal(float& value);
-  int readDouble(double& value);
   // An "S" text, trailing bytes of value 1 (padding) dropped.
   int readText(std::string& value);
 
@@ -81,6 +78,8 @@ class RecordFields {
   // Moves to the next item, which must be of `type`; `bytes` then points at
   // its storage, of which `size` bytes must lie inside the data.
   int nextItem(char type, std::size_t size, const unsigned char*& bytes);
+  // The next fixed-size item of `type`, its bytes taken in the file's order.
+  int readFixed(char type, std::uint64_t& raw);
 
   std::span<const unsigned char> data_;
   ByteOrder order_;
