@@ -17,19 +17,13 @@ int rewriteContourFile(const CheckedArray<Pocket*>& pockets) {
   if (expandNameInPlace(name, sizeof name) != EXPAND_OK) return -1;
   TaggedFile file = openTaggedFile(name, kTaggedCreateMode);
 
-  for (std::int32_t i = 0; i < pockets.count; ++i) {
-    float z = 0.0f;
-    if (collectPocketOutline(*pockets.data[i], outline, z) < 1) continue;
-    if (checkOutline(outline.data, outline.count, z, kOutlineClosureTolerance) != 0) {
-      closeTaggedFile(file);
-      return -1;
-    }
+  const bool checked = writeCheckedOutlines(pockets, outline, [&](float z) {
     writeTaggedRecord(file, 'n', z, z);
     writeContours(file, outline.data, outline.count);
     writeTaggedRecord(file, 'e', 0.0f, 0.0f);
-  }
+  });
   closeTaggedFile(file);
-  return 0;
+  return checked ? 0 : -1;
 }
 
 }  // namespace pc

@@ -7,6 +7,7 @@
 
 #include "contours/point.h"
 #include "driver/checked_array.h"
+#include "output/outline_check.h"
 #include "pockets/pocket_model.h"
 
 namespace pc {
@@ -25,5 +26,20 @@ std::int32_t outlineCapacityFor(std::int64_t entries);
 // The outline list of an output, large enough for the largest outline of
 // `pockets`.
 CheckedArray<Point> makeOutlineList(const CheckedArray<Pocket*>& pockets);
+
+// Hands each pocket's checked outline and its Z to `write`, in list order;
+// pockets without a contour are passed over. False as soon as an outline
+// fails the check (after its report): the caller then closes its file with
+// the pockets written so far.
+template <typename Write>
+bool writeCheckedOutlines(const CheckedArray<Pocket*>& pockets, CheckedArray<Point>& outline, Write write) {
+  for (std::int32_t i = 0; i < pockets.count; ++i) {
+    float z = 0.0f;
+    if (collectPocketOutline(*pockets.data[i], outline, z) < 1) continue;
+    if (checkOutline(outline.data, outline.count, z, kOutlineClosureTolerance) != 0) return false;
+    write(z);
+  }
+  return true;
+}
 
 }  // namespace pc

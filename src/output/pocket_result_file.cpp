@@ -49,18 +49,12 @@ int writePocketResultFile(const CheckedArray<Pocket*>& pockets) {
   writeHeaderLine(file);
 
   SeparatorState state;
-  for (std::int32_t i = 0; i < pockets.count; ++i) {
-    float z = 0.0f;
-    if (collectPocketOutline(*pockets.data[i], outline, z) < 1) continue;
-    if (checkOutline(outline.data, outline.count, z, kOutlineClosureTolerance) != 0) {
-      closeOrLose(file);
-      return -1;
-    }
+  const bool checked = writeCheckedOutlines(pockets, outline, [&](float z) {
     writeOutlinePoints(file, outline.data, outline.count, z, kPointLineCode, state);
     writeResultLine(file, kSeparatorValue, kSeparatorValue, kSeparatorValue, kPocketEndCode);
-  }
+  });
   closeOrLose(file);
-  return 0;
+  return checked ? 0 : -1;
 }
 
 }  // namespace pc

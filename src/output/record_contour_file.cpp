@@ -96,13 +96,7 @@ int writeRecordContourFile(const CheckedArray<Pocket*>& pockets) {
   if (status != 0) return -1;
   if (!recordUnitOps().isUnitOpen(unit)) loseRecordContourFile();
 
-  for (std::int32_t i = 0; i < pockets.count; ++i) {
-    float z = 0.0f;
-    if (collectPocketOutline(*pockets.data[i], outline, z) < 1) continue;
-    if (checkOutline(outline.data, outline.count, z, kOutlineClosureTolerance) != 0) {
-      closeRecordContourFile(unit);
-      return -1;
-    }
+  const bool checked = writeCheckedOutlines(pockets, outline, [&](float z) {
     for (std::int32_t e = 0; e < outline.count; ++e) {
       const Point& p = outline.data[e];
       if (isPointEntry(p)) {
@@ -111,9 +105,9 @@ int writeRecordContourFile(const CheckedArray<Pocket*>& pockets) {
         writeContourRecord(unit, kSeparatorValue, kSeparatorValue, kSeparatorValue, kRecordSeparatorCode, 0);
       }
     }
-  }
+  });
   closeRecordContourFile(unit);
-  return 0;
+  return checked ? 0 : -1;
 }
 
 }  // namespace pc
