@@ -107,7 +107,7 @@ int opensq(int unit, std::string_view name, int mode) {
   return code;
 }
 
-int openUnformatted(int unit, std::string_view name, int mode) {
+int openUnformatted(int unit, std::string_view name, int mode, RefusedOpen onRefusal) {
   const Expanded expanded = expandForSearch(name);
   int status = kIoOk;
   if (mode == 2) {
@@ -120,6 +120,7 @@ int openUnformatted(int unit, std::string_view name, int mode) {
     if (expanded.code != EXPAND_OK) return expanded.code;
     status = openUnit(unit, expanded.name, OpenDisposition::Old, FileForm::Unformatted);
   }
+  if (status != kIoOk && onRefusal == RefusedOpen::ReturnStatus) return status;
   if (status != kIoOk) {
     // The name was good but the system refused the file: the run cannot go on.
     const int values[] = {mode, status};

@@ -22,7 +22,11 @@ int opensq(int unit, std::string_view name, int mode);
 // Mode 2 deletes an existing file first and creates a new one (a code of
 // EXPAND_NOT_FOUND then means success); other modes open an existing file
 // only when the code is 0.
-int openUnformatted(int unit, std::string_view name, int mode);
+// A name that expanded but whose file the system refuses ends the run with
+// the layer's fatal report, unless the caller asks to have the runtime's
+// (positive) status back, to report the loss in its own words.
+enum class RefusedOpen { EndRun, ReturnStatus };
+int openUnformatted(int unit, std::string_view name, int mode, RefusedOpen onRefusal = RefusedOpen::EndRun);
 
 // Removes the named file; returns the expansion code, or -21 when the file
 // could not be removed.

@@ -30,7 +30,8 @@ constexpr int kCreateNewFile = 2;
 
 int defaultFreeUnit() { return fileio::freeUnit(); }
 int defaultOpenUnformatted(int unit, std::string_view name, int mode) {
-  return fileio::openUnformatted(unit, name, mode);
+  // A refused file is a lost output, reported like that of every other form.
+  return fileio::openUnformatted(unit, name, mode, fileio::RefusedOpen::ReturnStatus);
 }
 bool defaultIsUnitOpen(int unit) { return fileio::isUnitOpen(unit); }
 int defaultWriteRecord(int unit, const void* data, std::size_t size) { return fileio::writeRecord(unit, data, size); }
@@ -41,17 +42,6 @@ int defaultCloseUnit(int unit, bool deleteFile) { return fileio::closeUnit(unit,
   std::strcpy(name, kRecordContourFileName);
   expandNameInPlace(name, sizeof name);
   reportLostOutput(name, kRecordContourFileMode);
-}
-
-// The unit layer takes a file it cannot create for a fatal runtime error;
-// the file is created once here first, so that its loss is reported like
-// that of every other output. The layer then replaces it.
-void ensureCreatable() {
-  char name[512];
-  std::strcpy(name, kRecordContourFileName);
-  if (expandNameInPlace(name, sizeof name) != EXPAND_OK) return;  // left to the layer's status
-  std::FILE* file = outputFileHooks().open(name, kRecordContourFileMode);
-  if (file == nullptr || outputFileHooks().close(file) != 0) reportLostOutput(name, kRecordContourFileMode);
 }
 
 }  // namespace
@@ -70,6 +60,7 @@ void openRecordContourFile(int& unit, int& status) {
   unit = recordUnitOps().freeUnit();
   if (unit < 0) loseRecordContourFile();  // no unit to open the file on
   status = recordUnitOps().openUnformatted(unit, kRecordContourFileName, kCreateNewFile);
+  if (status > 0) loseRecordContourFile();  // the system refused the file
   if (status == EXPAND_NOT_FOUND) status = 0;
 }
 
@@ -89,7 +80,6 @@ int writeRecordContourFile(const CheckedArray<Pocket*>& pockets) {
   if (pockets.count < 1) return 0;
   CheckedArray<Point> outline = makeOutlineList(pockets);
 
-  ensureCreatable();
   int unit = -1;
   int status = 0;
   openRecordContourFile(unit, status);
