@@ -11,31 +11,14 @@
 #include "pockets/chain_index.h"
 #include "pockets/node_geometry.h"
 #include "pockets/pocket_model.h"
+#include "pockets/pocket_walk.h"
 
 namespace pc {
 
 namespace {
 
-// Deletes a chain of nodes with everything under them, in time linear in the
-// number of nodes and without a stack: a node's first child is moved in
-// front of it, so the chain being walked always holds what is left.
-void deleteNodeChain(ContourNode* node) {
-  while (node != nullptr) {
-    if (ContourNode* child = node->firstChild) {
-      node->firstChild = child->nextSibling;
-      child->nextSibling = node;
-      node = child;
-    } else {
-      ContourNode* next = node->nextSibling;
-      releaseSearchAids(*node);
-      delete node;
-      node = next;
-    }
-  }
-}
-
 void releaseTree(ZLevel& level) {
-  deleteNodeChain(level.root);
+  deleteChain(level.root, [](ContourNode& node) { releaseSearchAids(node); });
   level.root = nullptr;
   delete level.rootChain;
   level.rootChain = nullptr;

@@ -4,37 +4,18 @@
 
 namespace pc {
 
-namespace {
-
-// Deletes a chain of pockets with everything under them, without a stack: a
-// pocket's first child is moved in front of it until it has none left. The
-// nodes are told only while they are known to live: at the end of the run
-// the levels go before the forest.
-void deletePocketChain(Pocket* pocket, bool forgetInNodes) {
-  while (pocket != nullptr) {
-    if (Pocket* child = pocket->firstChild) {
-      pocket->firstChild = child->nextSibling;
-      child->nextSibling = pocket;
-      pocket = child;
-    } else {
-      Pocket* next = pocket->nextSibling;
-      // The node stays taken; it just has no pocket any more.
-      if (forgetInNodes && pocket->node != nullptr && pocket->node->pocket == pocket) pocket->node->pocket = nullptr;
-      delete pocket;
-      pocket = next;
-    }
-  }
-}
-
-}  // namespace
-
 void deletePocketTree(Pocket* pocket) {
   if (pocket == nullptr) return;
   pocket->nextSibling = nullptr;
-  deletePocketChain(pocket, true);
+  // The node stays taken; it just has no pocket any more.
+  deleteChain(pocket, [](Pocket& p) {
+    if (p.node != nullptr && p.node->pocket == &p) p.node->pocket = nullptr;
+  });
 }
 
-PocketForest::~PocketForest() { deletePocketChain(firstRoot, false); }
+// The nodes are not touched here: at the end of the run the levels go
+// before the forest.
+PocketForest::~PocketForest() { deleteChain(firstRoot, [](Pocket&) {}); }
 
 std::int32_t pocketCount(const PocketForest& forest) {
   std::int32_t count = 0;
