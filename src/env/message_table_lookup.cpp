@@ -1,6 +1,8 @@
 // Lookups in the message table: the first entry of a key in slot order, its
 // value with the `+` references resolved, and the origin of an entry.
+#include <algorithm>
 #include <cstdio>
+#include <cstring>
 #include <new>
 
 #include "env/diagnostic_channels.h"
@@ -20,8 +22,10 @@ constexpr std::size_t resolvedLimit = 1048576;
 // entries and every reference beyond the chain adds text, so only forged
 // references that point back at themselves get near this.
 constexpr std::size_t stepLimit = 1u << 20;
-// Steps traced in full per lookup; a hostile value would flood the trace.
+// Steps and characters traced in full per lookup; a hostile value would
+// flood the trace.
 constexpr std::size_t tracedSteps = 1000;
+constexpr std::size_t tracedCharacters = 1u << 22;
 constexpr std::size_t referenceLength = 12;  // "+(XXXXXXXX\)"
 
 // The process-wide result of the latest lookup that resolved references,
@@ -63,15 +67,22 @@ class Resolver {
       if (++steps_ > stepLimit) return false;
       step(out);
       if (out.size() > resolvedLimit) return false;
-      if (trace_ && steps_ <= tracedSteps) trace(out + rest());
+      if (traced()) {
+        const std::string text = out + rest();
+        tracedSize_ += text.size();
+        trace(text);
+        if (steps_ >= tracedSteps || tracedSize_ >= tracedCharacters) untracedFrom_ = steps_;
+      }
     }
-    if (trace_ && steps_ > tracedSteps) {
-      trace("   ... " + std::to_string(steps_ - tracedSteps) + " further resolution steps not traced");
+    if (untracedFrom_ > 0 && steps_ > untracedFrom_) {
+      trace("   ... " + std::to_string(steps_ - untracedFrom_) + " further resolution steps not traced");
     }
     return true;
   }
 
  private:
+  bool traced() const { return trace_ && untracedFrom_ == 0; }
+
   void push(std::string_view text, std::int32_t entry) {
     pieces_.push_back(Piece{text.data(), text.size(), 0, entry});
   }
@@ -112,7 +123,7 @@ class Resolver {
   std::string originLabel(std::int32_t entry) const { return originOf(table_, entry).value_or(""); }
 
   void step(std::string& out) {
-    const bool traced = trace_ && steps_ <= tracedSteps;
+    const bool traced = this->traced();
     if (peek(1) == '+') {
       out += '+';
       consume(2);
@@ -160,6 +171,8 @@ class Resolver {
   bool trace_;
   std::vector<Piece> pieces_;
   std::size_t steps_ = 0;
+  std::size_t tracedSize_ = 0;
+  std::size_t untracedFrom_ = 0;  // the step after which the trace went quiet
 };
 
 struct Found {
@@ -180,12 +193,14 @@ std::optional<Found> resolve(MessageTable* table, int section, std::string_view 
     Resolver resolver(table, entry);
     if (!resolver.run(resultBuffer)) {
       resultBuffer.clear();
+      resultTable = nullptr;
       warning("Message table: the value of [" + std::string(sectionName(table, section)) + "] " + std::string(key) +
               " passes " + std::to_string(resolvedLimit) + " bytes once resolved; it is taken as undefined");
       return std::nullopt;
     }
   } catch (const std::bad_alloc&) {
     resultBuffer.clear();
+    resultTable = nullptr;
     warning("Dynamic storage: no more memory\n");
     return std::nullopt;
   }
