@@ -101,6 +101,15 @@ MessageTable* createTable() {
   return table;
 }
 
+void destroyTable(MessageTable* table) {
+  if (table == nullptr) return;
+  forgetResult(table);
+  for (int section = 0; section < sectionTotal(table); ++section) destroyPool(sectionPool(table, section));
+  destroyPool(table->strings);
+  destroyPool(table->root);
+  delete table;
+}
+
 int sectionCount(const MessageTable* table) { return table != nullptr ? sectionTotal(table) : 0; }
 
 DynamicStorage* sectionPool(const MessageTable* table, int section) {

@@ -20,6 +20,9 @@ constexpr int refusedSection = 65535;
 
 // A new empty table, or nullptr on exhausted storage.
 MessageTable* createTable();
+// Releases a table and its pools. The process-wide tables live to the end of
+// the process; this is for tables of a passing use (tests, fuzzing).
+void destroyTable(MessageTable* table);
 
 // Number of the first section named exactly `name`, or -1.
 int findSection(const MessageTable* table, std::string_view name);

@@ -93,6 +93,8 @@ std::string_view storedText(const MessageTable* table, std::int32_t offset);
 std::optional<EntryRecord> recordOf(const MessageTable* table, std::int32_t textOffset);
 // "from '<file>' line <n>", "set by program", or "" (nullopt) for an entry text.
 std::optional<std::string> originOf(const MessageTable* table, std::int32_t textOffset);
+// Forgets a lookup result that came from `table`.
+void forgetResult(const MessageTable* table);
 // The slot of the first entry whose key is `key` (exact, or without regard to case), or -1.
 std::int32_t findSlot(MessageTable* table, int section, std::string_view key, bool foldedKey);
 

@@ -211,6 +211,10 @@ std::optional<Found> resolve(MessageTable* table, int section, std::string_view 
 
 }  // namespace
 
+void forgetResult(const MessageTable* table) {
+  if (resultTable == table) resultTable = nullptr;
+}
+
 std::optional<std::string_view> entryKey(std::string_view text) {
   std::size_t start = 0;
   while (start < text.size() && isBlank(text[start])) ++start;

@@ -30,6 +30,7 @@ class MessageTableTest : public ::testing::Test {
     table = createTable();
   }
   ~MessageTableTest() override {
+    destroyTable(table);
     setParameterMode(true);
     setWarningHandler(nullptr);
     setFatalHandler(nullptr);
@@ -45,7 +46,7 @@ class MessageTableTest : public ::testing::Test {
     return found ? found->origin : "<absent>";
   }
 
-  MessageTable* table = nullptr;  // pools are never released, like the process-wide table
+  MessageTable* table = nullptr;
 };
 
 TEST_F(MessageTableTest, LayeredPathListsResolveTheirReferences) {
@@ -118,6 +119,11 @@ TEST_F(MessageTableTest, DuplicatesCaseRulesAndSectionNames) {
   EXPECT_EQ(entryCount(table, var), 2);
   EXPECT_EQ(value(var, "X"), "31");
   EXPECT_STREQ(entryText(table, var, 1), "  X=2");
+  // A direct overload may change the key of a slot: the next X is found then.
+  ASSERT_EQ(overloadEntry(table, var, 0, "Y = y+", later, 8), 0);
+  EXPECT_EQ(value(var, "x"), "2");
+  EXPECT_EQ(value(var, "y"), "y31");
+  EXPECT_EQ(overloadEntry(table, var, 2, "Z = z", later, 9), -1);
 
   // Overloading compares keys with case, lookups without.
   const int path = addSection(table, "path");
@@ -241,6 +247,7 @@ TEST_F(MessageTableTest, ValuesPassingOneMebibyteAreAbsent) {
   ASSERT_EQ(addEntry(forged, section, "S=+(0000000C\\)", -1, 0), 0);
   EXPECT_EQ(lookup(forged, section, "S"), nullptr);
   EXPECT_EQ(captured.warnings.size(), 2u);
+  destroyTable(forged);
 }
 
 }  // namespace
