@@ -191,7 +191,8 @@ void writeEmptyResultMarker() {
 void removeStaleOffsetError() {
   char name[512] = "$TMP/offset2.err";
   expandNameInPlace(name, sizeof name);
-  if (std::FILE* stale = std::fopen(name, "r")) {
+  // Only a regular file: a FIFO of that name would block the open for ever.
+  if (std::FILE* stale = platform::openExistingFile(name, "r", true)) {
     std::fclose(stale);
     std::remove(name);
   }

@@ -22,19 +22,14 @@
 // the end of the data so that the next write appends.
 #include "fileio/record_runtime.h"
 
+#include "fileio/memory_files.h"
 #include "fileio/unit_table.h"
 
 namespace pc::fileio {
 
 using namespace detail;
 
-namespace {
-
-std::FILE* openStream(const std::string& name, const char* mode) { return std::fopen(name.c_str(), mode); }
-
-}  // namespace
-
-int openUnit(int unit, const std::string& name, OpenDisposition disposition, FileForm form) {
+int openUnit(int unit, const std::string& name, OpenDisposition disposition, FileForm form, UnitUse use) {
   if (unit < 1) return kIoErrorUnit;
   const std::string path = trimTrailingBlanks(name);
   if (path.empty()) return kIoErrorOpen;
@@ -51,12 +46,17 @@ int openUnit(int unit, const std::string& name, OpenDisposition disposition, Fil
   if (disposition == OpenDisposition::New && exists) return kIoErrorOpen;
 
   auto u = std::make_unique<Unit>();
-  if (exists) {
-    u->file.reset(openStream(path, "r+b"));
+  if (disposition != OpenDisposition::New) u->file.reset(openMemoryFile(path));
+  if (u->file) {
+    u->writable = false;
+  } else if (exists) {
+    const bool regularOnly = use == UnitUse::Read;
+    u->file.reset(platform::openExistingFile(path, "r+b", regularOnly));
     u->writable = u->file != nullptr;
-    if (!u->file) u->file.reset(openStream(path, "rb"));  // read-only files are still readable
+    // Read-only files are still readable.
+    if (!u->file) u->file.reset(platform::openExistingFile(path, "rb", regularOnly));
   } else {
-    u->file.reset(openStream(path, "w+b"));
+    u->file.reset(std::fopen(path.c_str(), "w+b"));
     u->writable = true;
   }
   if (!u->file) return kIoErrorOpen;

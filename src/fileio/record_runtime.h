@@ -28,7 +28,12 @@ enum class FileForm { Formatted, Unformatted };
 // Opens `unit` on the named file for sequential access, positioned at its
 // start. Old: must exist. New: must not exist, created. Unknown: opened when
 // it exists, created otherwise. Status 0 when open; non-zero: nothing opened.
-int openUnit(int unit, const std::string& name, OpenDisposition disposition, FileForm form);
+// A unit opened only to be read is refused on anything but a regular file:
+// a FIFO, a socket or a device could block the run or never end. Any unit
+// is refused on a FIFO or a socket, which are never opened blocking.
+enum class UnitUse { ReadWrite, Read };
+int openUnit(int unit, const std::string& name, OpenDisposition disposition, FileForm form,
+             UnitUse use = UnitUse::ReadWrite);
 // Closes the unit (and deletes its file when asked). A pending write error,
 // or a failure to flush, gives a positive status; the unit is free afterwards.
 int closeUnit(int unit, bool deleteFile = false);

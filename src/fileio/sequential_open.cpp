@@ -68,7 +68,8 @@ int openFormatted(int unit, const std::string& name, int m) {
   if (name.empty()) return m == 1 ? kMissing : kOpenFailed;
   const bool existed = namedFileExists(name);
   if (m == 1 && !existed) return kMissing;
-  if (openUnit(unit, name, OpenDisposition::Unknown, FileForm::Formatted) != kIoOk) return kOpenFailed;
+  const UnitUse use = m == 1 ? UnitUse::Read : UnitUse::ReadWrite;
+  if (openUnit(unit, name, OpenDisposition::Unknown, FileForm::Formatted, use) != kIoOk) return kOpenFailed;
   if (m == 3) return positionAtEnd(unit);
   if (m == 2 && existed) {
     if (closeUnit(unit, true) != kIoOk) return kDeleteFailed;
@@ -118,7 +119,7 @@ int openUnformatted(int unit, std::string_view name, int mode, RefusedOpen onRef
     status = openUnit(unit, expanded.name, OpenDisposition::New, FileForm::Unformatted);
   } else {
     if (expanded.code != EXPAND_OK) return expanded.code;
-    status = openUnit(unit, expanded.name, OpenDisposition::Old, FileForm::Unformatted);
+    status = openUnit(unit, expanded.name, OpenDisposition::Old, FileForm::Unformatted, UnitUse::Read);
   }
   if (status != kIoOk && onRefusal == RefusedOpen::ReturnStatus) return status;
   if (status != kIoOk) {

@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstdio>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -81,5 +82,15 @@ void releaseLarge(void* block);
 // not be written is removed again.
 enum class ExclusiveCreation { Created, Exists, Failed, WriteFailed };
 ExclusiveCreation createExclusiveFile(const std::string& name, std::string_view content);
+
+// Opens an existing file for reading with the standard I/O `mode` ("rb" or
+// "r+b") without ever blocking: a FIFO or a socket is refused, and with
+// `regularOnly` anything but a regular file (a device, a directory) too. A
+// refused file is reported like one that cannot be opened: nullptr.
+std::FILE* openExistingFile(const std::string& name, const char* mode, bool regularOnly);
+
+// A read-only stream over `size` bytes at `data`, which must outlive it;
+// nullptr when it cannot be had.
+std::FILE* openMemoryStream(const void* data, std::size_t size);
 
 }  // namespace pc::platform

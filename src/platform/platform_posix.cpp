@@ -149,6 +149,31 @@ ExclusiveCreation createExclusiveFile(const std::string& name, std::string_view 
   return ExclusiveCreation::Created;
 }
 
+std::FILE* openExistingFile(const std::string& name, const char* mode, bool regularOnly) {
+  if (name.empty() || mode == nullptr || mode[0] != 'r') return nullptr;
+  const bool update = std::string_view(mode).find('+') != std::string_view::npos;
+  // Without O_NONBLOCK the open of a FIFO waits for a writer, for ever.
+  const int fd = ::open(name.c_str(), (update ? O_RDWR : O_RDONLY) | O_NONBLOCK | O_CLOEXEC);
+  if (fd < 0) return nullptr;
+  struct stat st {};
+  const bool refused = ::fstat(fd, &st) != 0 || S_ISFIFO(st.st_mode) || S_ISSOCK(st.st_mode) ||
+                       S_ISDIR(st.st_mode) || (regularOnly && !S_ISREG(st.st_mode));
+  const int flags = refused ? -1 : ::fcntl(fd, F_GETFL);
+  if (flags < 0 || ::fcntl(fd, F_SETFL, flags & ~O_NONBLOCK) != 0) {
+    ::close(fd);
+    return nullptr;
+  }
+  std::FILE* file = ::fdopen(fd, mode);
+  if (file == nullptr) ::close(fd);
+  return file;
+}
+
+std::FILE* openMemoryStream(const void* data, std::size_t size) {
+  // The stream is only read, so the bytes are never written through it.
+  static unsigned char empty = 0;
+  return ::fmemopen(size == 0 ? &empty : const_cast<void*>(data), size, "rb");
+}
+
 }  // namespace pc::platform
 
 #endif  // !_WIN32

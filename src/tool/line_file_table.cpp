@@ -6,6 +6,9 @@
 #include <cstdlib>
 #include <string>
 
+#include "fileio/memory_files.h"
+#include "platform/platform.h"
+
 namespace pc {
 
 namespace {
@@ -68,7 +71,16 @@ void lineFileOpen(int& handle, std::string_view name, int mode, int& status) {
     status = failure;
     return;
   }
-  std::FILE* f = std::fopen(path.c_str(), kModes[static_cast<std::size_t>(index)]);
+  std::FILE* f = nullptr;
+  if (index < 2) {
+    // The two reading modes: never a FIFO, a socket or a device, which could
+    // block the run for ever; a memory file stands in for the file when one
+    // is registered under its name.
+    f = fileio::openMemoryFile(path);
+    if (f == nullptr) f = platform::openExistingFile(path, kModes[static_cast<std::size_t>(index)], true);
+  } else {
+    f = std::fopen(path.c_str(), kModes[static_cast<std::size_t>(index)]);
+  }
   if (f == nullptr) {
     status = failure;
     return;

@@ -23,7 +23,8 @@ std::optional<std::string> readLockFile(const std::string& name, std::size_t lim
   struct Closer {
     void operator()(std::FILE* file) const { std::fclose(file); }
   };
-  std::unique_ptr<std::FILE, Closer> file(std::fopen(name.c_str(), "rb"));
+  // A FIFO in place of the lock would block the open for ever.
+  std::unique_ptr<std::FILE, Closer> file(platform::openExistingFile(name, "rb", true));
   if (!file) return std::nullopt;
   std::string content(limit, '\0');
   const std::size_t n = std::fread(content.data(), 1, limit, file.get());

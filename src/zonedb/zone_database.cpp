@@ -9,6 +9,7 @@
 #include <string>
 #include <vector>
 
+#include "env/diagnostic_channels.h"
 #include "platform/platform.h"
 #include "zonedb/zone_database_testing.h"
 #include "zonedb/zone_lock.h"
@@ -28,16 +29,27 @@ LockTiming& queryLockTiming() {
   return timing;
 }
 
+void reportLockedDatabase(const std::string& database, const std::string& lock) {
+  fatal("Zone database '" + database + "' cannot be read: its lock file '" + lock +
+        "' can be neither taken nor broken");
+}
+
 // Finds the record of `item` and checks its format and leading state and
 // code fields; `decode` reads the value fields. Returns the record's position
 // or a negative status.
 template <typename Decode>
 int readZoneRecord(int item, std::string_view numberedRecordCode, Decode&& decode) {
   ZoneLockGuard lock(zoneLockName(), queryLockTiming());
-  if (!lock.held()) return kCannotOpen;
   const std::string& name = zoneDatabaseName();
   // A zone without a database simply has no record; a read creates nothing.
   if (!platform::pathExists(name)) return kNoRecord;
+  if (!lock.held()) {
+    // The database is there but out of reach: going on with a default in
+    // place of its values (a unit scale of 1 for 25.4) would machine the
+    // part wrong without a word.
+    reportLockedDatabase(name, zoneLockName());
+    return kCannotOpen;
+  }
   if (!platform::isRegularFile(name)) return kCannotOpen;
 
   ZoneRecordFile file;

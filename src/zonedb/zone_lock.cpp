@@ -82,6 +82,12 @@ ZoneLock acquireZoneLock(const std::string& lockName, const LockTiming& timing) 
         ours = true;
         break;
       case LockCreation::Exists: {
+        // A directory, a FIFO or a device can never be a lock: neither
+        // waiting nor breaking would ever take it.
+        if (!platform::isRegularFile(lockName) && platform::pathExists(lockName)) {
+          result.state = kLockGivenUp;
+          return result;
+        }
         const auto holder = readLockFile(lockName, kOwnerProbeBytes);
         ours = holder && lockHeldBy(*holder, pid);
         break;
@@ -132,7 +138,9 @@ bool zoneLockValid(const std::string& lockName, std::int64_t token) {
 }
 
 int releaseZoneLock(const std::string& lockName) {
-  bool removed = platform::removeFile(lockName);
+  // A lock broken by another process while we stalled, and taken over by
+  // it, is not ours to remove any more.
+  bool removed = heldByThisProcess(lockName) && platform::removeFile(lockName);
   if (!removed) {
     // The zone was named relative to a directory that has gone from under
     // us (the current directory changed): the lock may sit under its bare

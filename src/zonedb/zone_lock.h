@@ -34,6 +34,9 @@ struct ZoneLock {
 };
 
 // Waits, polling every 200 ms, while another live holder keeps the lock.
+// Gives up at once when the lock's name is taken by something that is not a
+// regular file (a directory, a FIFO), and after 10 s when an abandoned lock
+// cannot be removed.
 ZoneLock acquireZoneLock(const std::string& lockName, const LockTiming& timing);
 ZoneLock acquireZoneLock(const std::string& lockName);
 
@@ -43,7 +46,8 @@ bool zoneLockValid(const std::string& lockName, std::int64_t token);
 inline constexpr int kLockRemoved = 1;
 inline constexpr int kLockNotRemoved = 2;
 
-// Removes the lock file: kLockRemoved or kLockNotRemoved.
+// Removes the lock file while it still holds this process's number:
+// kLockRemoved, or kLockNotRemoved (also when another process holds it).
 int releaseZoneLock(const std::string& lockName);
 
 // True when the text is a process number equal to `processId` (digits,

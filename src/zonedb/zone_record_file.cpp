@@ -2,6 +2,9 @@
 
 #include <new>
 
+#include "fileio/memory_files.h"
+#include "platform/platform.h"
+
 #include "zonedb/zone_status.h"
 
 namespace pc::zonedb {
@@ -18,7 +21,9 @@ bool readAt(std::FILE* file, std::uint64_t offset, unsigned char* bytes, std::si
 }  // namespace
 
 int ZoneRecordFile::open(const std::string& name) {
-  file_.reset(std::fopen(name.c_str(), "rb"));
+  // Never a FIFO or a device: the query would block or read for ever.
+  file_.reset(fileio::openMemoryFile(name));
+  if (!file_) file_.reset(platform::openExistingFile(name, "rb", true));
   if (!file_) return kCannotOpen;
   if (std::fseek(file_.get(), 0, SEEK_END) != 0) return kCannotOpen;
   const long end = std::ftell(file_.get());

@@ -95,6 +95,16 @@ bool knownType(char type) { return std::strchr("CLWIRDS", type) != nullptr && ty
 
 bool isDigit(char c) { return c >= '0' && c <= '9'; }
 
+// Length of the format text at the front of a record's data, npos when it
+// has no NUL. A record without data (an empty vector holds no storage) never
+// hands a null pointer to the C library.
+std::size_t formatLength(std::span<const unsigned char> data) {
+  if (data.empty()) return std::string_view::npos;
+  const void* nul = std::memchr(data.data(), 0, data.size());
+  if (nul == nullptr) return std::string_view::npos;
+  return static_cast<std::size_t>(static_cast<const unsigned char*>(nul) - data.data());
+}
+
 }  // namespace
 
 std::uint16_t decodeUint16(const unsigned char* bytes, ByteOrder order) {
@@ -148,9 +158,9 @@ std::string numberedCode(int number) {
 }
 
 int decodeRecordKey(std::span<const unsigned char> data, RecordKey& key) {
-  const void* nul = std::memchr(data.data(), 0, data.size());
-  if (nul == nullptr) return kBadFormat;
-  const std::size_t at = static_cast<std::size_t>(static_cast<const unsigned char*>(nul) - data.data()) + 1;
+  const std::size_t length = formatLength(data);
+  if (length == std::string_view::npos) return kBadFormat;
+  const std::size_t at = length + 1;
   if (data.size() - at < 3) return kBeyondRecord;
   key.state = static_cast<char>(data[at]);
   key.code[0] = static_cast<char>(data[at + 1]);
@@ -170,12 +180,11 @@ int itemOfRecord(const RecordKey& key, std::string_view numberedRecordCode) {
 
 RecordFields::RecordFields(std::span<const unsigned char> data, ByteOrder order)
     : data_(data), order_(order) {
-  const void* nul = std::memchr(data.data(), 0, data.size());
-  if (nul == nullptr) {
+  const std::size_t length = formatLength(data);
+  if (length == std::string_view::npos) {
     status_ = kBadFormat;
     return;
   }
-  const std::size_t length = static_cast<std::size_t>(static_cast<const unsigned char*>(nul) - data.data());
   format_ = std::string_view(reinterpret_cast<const char*>(data.data()), length);
   dataPos_ = length + 1;
 }

@@ -1,11 +1,13 @@
 #include "fileio/record_runtime.h"
 
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <cstdint>
 #include <string>
 #include <utility>
 
+#include "fileio/memory_files.h"
 #include "support/test_support.h"
 
 namespace pc::fileio {
@@ -123,6 +125,16 @@ TEST_F(RecordRuntime, RefusalsAndWriteFailures) {
   EXPECT_EQ(rec(1), status(kIoErrorUnit));
   EXPECT_EQ(closed(), "keep");  // closing a closed unit is harmless
 
+  // Nothing that is not a regular file is opened to be read, and nothing
+  // blocks: a FIFO is refused for any use, a device for reading.
+  const std::string fifo = dir.file("fifo");
+  ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
+  for (const UnitUse use : {UnitUse::Read, UnitUse::ReadWrite}) {
+    EXPECT_EQ(openUnit(kUnit, fifo, OpenDisposition::Old, FileForm::Unformatted, use), kIoErrorOpen);
+  }
+  EXPECT_EQ(openUnit(kUnit, "/dev/zero", OpenDisposition::Old, FileForm::Formatted, UnitUse::Read), kIoErrorOpen);
+  EXPECT_FALSE(isUnitOpen(kUnit));
+
   // A write failure is reported at the latest on close.
   if (!test::fileExists("/dev/full")) GTEST_SKIP() << "no /dev/full here";
   ASSERT_EQ(openUnit(kUnit, "/dev/full", OpenDisposition::Old, FileForm::Unformatted), kIoOk);
@@ -131,6 +143,29 @@ TEST_F(RecordRuntime, RefusalsAndWriteFailures) {
   ASSERT_EQ(openUnit(kUnit, "/dev/full", OpenDisposition::Old, FileForm::Formatted), kIoOk);
   EXPECT_EQ(writeTextRecord(kUnit, std::string(2 * 1024 * 1024, 'l')), kIoErrorSystem);  // beyond the buffer
   EXPECT_EQ(closeUnit(kUnit), kIoErrorSystem);
+}
+
+// Bytes registered under a name are read in place of that file's content,
+// with the same framing and statuses; writing opens the real file.
+TEST_F(RecordRuntime, MemoryFilesStandInForTheirFileWhenRead) {
+  const std::string bytes = framedRecord("abc") + framedRecord("de") + "\1\0";
+  test::writeFile(path, "");
+  setMemoryFile(path, {reinterpret_cast<const unsigned char*>(bytes.data()), bytes.size()});
+  ASSERT_EQ(openUnit(kUnit, path, OpenDisposition::Old, FileForm::Unformatted, UnitUse::Read), kIoOk);
+  EXPECT_EQ(rec(3), "abc");
+  EXPECT_EQ(rec(3), status(kIoErrorRecord));  // shorter than asked
+  EXPECT_EQ(rec(2), "de");
+  EXPECT_EQ(rec(1), status(kIoErrorRecord));  // cut framing
+  EXPECT_EQ(writeRecord(kUnit, "x", 1), kIoErrorUnit);  // memory is never written
+  EXPECT_EQ(closeUnit(kUnit), kIoOk);
+  setMemoryFile(path, {});
+  ASSERT_EQ(openUnit(kUnit, path, OpenDisposition::Old, FileForm::Formatted), kIoOk);
+  EXPECT_EQ(line(), status(kIoEnd));
+  EXPECT_EQ(closeUnit(kUnit), kIoOk);
+  clearMemoryFiles();
+  ASSERT_EQ(openUnit(kUnit, path, OpenDisposition::Unknown, FileForm::Formatted), kIoOk);
+  EXPECT_EQ(writeTextRecord(kUnit, "real"), kIoOk);
+  EXPECT_EQ(closed(), "real\n");
 }
 
 }  // namespace

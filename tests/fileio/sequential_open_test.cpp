@@ -2,6 +2,7 @@
 #include "fileio/sequential_open.h"
 
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <cstdio>
 #include <string>
@@ -90,6 +91,9 @@ TEST_F(SequentialOpen, FailuresGiveTheirCodeOrEndTheRun) {
                              {"   ", 3, 1}, {dir.path(), 2, 1}, {dir.file("no/such/dir.txt"), 3, 1}};
   // A file that exists but cannot be deleted.
   if (test::fileExists("/proc/self/status")) cases.push_back({"/proc/self/status", 2, 2});
+  // A FIFO is never read (it would block): a file that cannot be opened.
+  ASSERT_EQ(::mkfifo(dir.file("fifo").c_str(), 0600), 0);
+  cases.push_back({dir.file("fifo"), 1, 1});
   for (const Case& c : cases) {
     EXPECT_EQ(opensq(9, c.name, c.mode), c.code) << c.name << " mode " << c.mode;
     EXPECT_FALSE(isUnitOpen(9)) << c.name;

@@ -1,11 +1,13 @@
 #include "tool/line_file_table.h"
 
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <climits>
 #include <tuple>
 #include <utility>
 
+#include "fileio/memory_files.h"
 #include "support/test_support.h"
 
 namespace pc {
@@ -74,11 +76,23 @@ TEST(LineFileTable, OpenCloseHandlesAndLineStatuses) {
   EXPECT_EQ(readLine(handle, 5), (Line{"     ", kLineEnd}));
   closeFile(handle);
 
-  // A directory opens on some systems but cannot be read as lines.
-  if (const auto [h, s] = openFile(dir.path(), 1); s == kLineOk) {
-    EXPECT_EQ(readLine(h, 2).second, kLineIoError);
-    closeFile(h);
+  // Nothing but a regular file is opened to be read, and nothing blocks: a
+  // directory, a FIFO or a device is a file that cannot be opened.
+  const std::string fifo = dir.file("fifo");
+  ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
+  for (const std::string& name : {dir.path(), fifo, std::string("/dev/zero")}) {
+    for (const int mode : {0, 1}) EXPECT_EQ(openFile(name, mode), (Opened{-1, kLineIoError})) << name;
   }
+
+  // Bytes registered under the name stand in for the file when it is read.
+  const std::string bytes = "one\ntwo";
+  fileio::setMemoryFile(dir.file("f"), {reinterpret_cast<const unsigned char*>(bytes.data()), bytes.size()});
+  const auto [memory, memoryStatus] = openFile(dir.file("f"), 1);
+  ASSERT_EQ(memoryStatus, kLineOk);
+  EXPECT_EQ(readLine(memory, 4), (Line{"one ", kLineOk}));
+  EXPECT_EQ(readLine(memory, 4), (Line{"two ", kLinePartial}));
+  closeFile(memory);
+  fileio::clearMemoryFiles();
 }
 
 }  // namespace

@@ -5,7 +5,9 @@
 #include <bit>
 #include <filesystem>
 #include <tuple>
+#include <vector>
 
+#include "env/diagnostic_channels.h"
 #include "support/test_support.h"
 #include "zonedb/zone_database_testing.h"
 #include "zonedb/zone_record_format.h"
@@ -110,6 +112,7 @@ TEST(ZoneQueries, ValuesOfEachFileInBothOrdersLeaveItUntouchedAndUnlocked) {
         {patched(12, z.number(159, 4)), 6, kUnreadableFile},  // first record inside the header
         {z.file({}), 6, kNoRecord},
         {z.file({"001C 002C 001S  EC"}), 6, kBadFormat},  // no NUL
+        {z.file({""}), 6, kBadFormat},  // no data at all: no format text
         {z.file({"001C \0 E"s}), 6, kBeyondRecord},
         {z.file({record("001I ", "EC", z.number(2, 4))}), 6, kBadFormat},
         {z.file({record("001I ", "CN", z.number(2, 4))}), 5, kWrongFieldType},
@@ -142,11 +145,48 @@ TEST(ZoneQueries, ValuesOfEachFileInBothOrdersLeaveItUntouchedAndUnlocked) {
   fs::create_directory(database);
   EXPECT_EQ(zoneRealValue(6, value), kCannotOpen);
   fs::current_path(previous);
-  // A zone directory that does not exist: its lock cannot be made.
+  // A zone directory that does not exist: its lock cannot be made, but
+  // there is no database to lose either.
   test::ScopedEnv absent("TRXZONE", dir.file("absent"));
   resetZoneNamesForTesting();
-  EXPECT_EQ(zoneRealValue(6, value), kCannotOpen);
+  EXPECT_EQ(zoneRealValue(6, value), kNoRecord);
   EXPECT_EQ(clock, 10000);  // no more waiting
+  setLockTimingForTesting({});
+  resetZoneNamesForTesting();
+}
+
+std::vector<std::string>& fatalMessages() {
+  static std::vector<std::string> messages;
+  return messages;
+}
+
+// A database that is there but whose lock can be neither taken nor broken is
+// a lost input: it goes to the fatal channel, naming the lock; without a
+// database the default stands.
+TEST(ZoneQueries, LockInTheWayOfAnExistingDatabaseIsFatal) {
+  test::TempDir dir;
+  test::ScopedEnv zone("TRXZONE", dir.path());
+  resetZoneNamesForTesting();
+  std::int64_t clock = 0;
+  setLockTimingForTesting({[&clock] { return clock; }, [&clock](unsigned ms) { clock += ms; }});
+  const MessageHandler previous = setFatalHandler([](const char* m) { fatalMessages().push_back(m); });
+  const std::string lock = dir.file("zone.lck");
+  fs::create_directory(lock);
+
+  float value = -7.0f;
+  std::string text(8, '?');
+  EXPECT_EQ(zoneRealValue(6, value), kNoRecord);
+  EXPECT_TRUE(fatalMessages().empty());
+  test::writeFile(dir.file("zone.inf"), ZoneBytes{}.file({ZoneBytes{}.ec(25.4f)}));
+  EXPECT_EQ(zoneRealValue(6, value), kCannotOpen);
+  EXPECT_EQ(zoneTextValue(31, text), kCannotOpen);
+  EXPECT_EQ(std::tuple(value, text, clock), std::tuple(-7.0f, "        "s, 0));  // given up at once
+  const std::string expected = "Zone database '" + dir.file("zone.inf") + "' cannot be read: its lock file '" + lock +
+                               "' can be neither taken nor broken";
+  EXPECT_EQ(fatalMessages(), std::vector<std::string>(2, expected));
+  EXPECT_TRUE(fs::is_directory(lock));
+
+  setFatalHandler(previous);
   setLockTimingForTesting({});
   resetZoneNamesForTesting();
 }

@@ -1,6 +1,7 @@
 #include "zonedb/zone_lock.h"
 
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -77,11 +78,23 @@ TEST_F(ZoneLockTest, TakenAtOnceOrAfterWaitingForLiveHolders) {
   EXPECT_FALSE(zoneLockValid(lock_, lock.token));
   EXPECT_EQ(releaseZoneLock(lock_), kLockNotRemoved);
 
-  // A directory in the way can be neither read nor removed as a file.
+  // A lock held by another process is left alone by our release.
+  test::writeFile(lock_, kForeign);
+  EXPECT_EQ(releaseZoneLock(lock_), kLockNotRemoved);
+  EXPECT_EQ(test::readFile(lock_), kForeign);
+  fs::remove(lock_);
+
+  // A directory or a FIFO in the way can never be a lock: given up at once,
+  // without waiting, without blocking and without removing it.
   fs::create_directory(lock_);
   const ZoneLock refused = acquire();
-  EXPECT_EQ(std::tuple(refused.state, refused.token, sleeps_), std::tuple(kLockGivenUp, 0, 50));
+  EXPECT_EQ(std::tuple(refused.state, refused.token, sleeps_), std::tuple(kLockGivenUp, 0, 0));
   EXPECT_TRUE(fs::is_directory(lock_));
+  fs::remove(lock_);
+  ASSERT_EQ(::mkfifo(lock_.c_str(), 0600), 0);
+  const ZoneLock fifo = acquire();
+  EXPECT_EQ(std::tuple(fifo.state, fifo.token, sleeps_), std::tuple(kLockGivenUp, 0, 0));
+  EXPECT_TRUE(fs::is_fifo(lock_));
 }
 
 TEST_F(ZoneLockTest, OwnLockByProcessNumberAndReleaseByTheBareName) {
