@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <limits>
 #include <new>
+#include <type_traits>
 #include <utility>
 
 #include "driver/fatal_report.h"
@@ -40,7 +41,7 @@ struct CheckedArray {
     }
     return *this;
   }
-  ~CheckedArray() { delete[] data; }
+  ~CheckedArray() { release(data); }
 
   void append(const T& value) {
     if (data != nullptr && count < capacity) {
@@ -59,7 +60,7 @@ struct CheckedArray {
     }
     for (std::int32_t i = 0; i < count; ++i) grown[i] = data[i];
     grown[count++] = value;
-    delete[] data;
+    release(data);
     data = grown;
     capacity = newCapacity;
   }
@@ -78,7 +79,7 @@ struct CheckedArray {
   void reset() { count = 0; }
 
   void clear() {
-    delete[] data;
+    release(data);
     data = nullptr;
     count = 0;
     capacity = 0;
@@ -96,8 +97,24 @@ struct CheckedArray {
     if (static_cast<std::uint64_t>(slots) > std::numeric_limits<std::size_t>::max() / sizeof(T)) {
       return nullptr;
     }
-    return new (std::nothrow) T[static_cast<std::size_t>(slots)]();
+    const std::size_t n = static_cast<std::size_t>(slots);
+    // Slots beyond `count` are never read, so plain elements are not
+    // initialised: the large outline lists then cost no more pages than
+    // their points fill.
+    if constexpr (kPlain) {
+      return static_cast<T*>(::operator new(n * sizeof(T), std::nothrow));
+    } else {
+      return new (std::nothrow) T[n]();
+    }
   }
+  static void release(T* block) {
+    if constexpr (kPlain) {
+      ::operator delete(block);
+    } else {
+      delete[] block;
+    }
+  }
+  static constexpr bool kPlain = std::is_trivially_copyable_v<T> && std::is_trivially_destructible_v<T>;
 };
 
 }  // namespace pc

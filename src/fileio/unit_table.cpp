@@ -2,6 +2,24 @@
 
 namespace pc::fileio::detail {
 
+namespace {
+
+std::unique_ptr<unsigned char[]>& spareBuffer() {
+  static std::unique_ptr<unsigned char[]> spare;
+  return spare;
+}
+
+}  // namespace
+
+std::unique_ptr<unsigned char[]> takeUnitBuffer() {
+  if (spareBuffer()) return std::move(spareBuffer());
+  return std::unique_ptr<unsigned char[]>(new unsigned char[kBufferSize]);
+}
+
+void returnUnitBuffer(std::unique_ptr<unsigned char[]> buffer) {
+  if (buffer && !spareBuffer()) spareBuffer() = std::move(buffer);
+}
+
 UnitTable& table() {
   static UnitTable instance;
   return instance;

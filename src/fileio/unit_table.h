@@ -37,13 +37,18 @@ inline std::string trimTrailingBlanks(const std::string& name) {
   return end == std::string::npos ? std::string{} : name.substr(0, end + 1);
 }
 
+// The buffers of closed units are kept for the next unit: a run opens the
+// same file several times, and each fresh megabyte costs its page faults.
+std::unique_ptr<unsigned char[]> takeUnitBuffer();
+void returnUnitBuffer(std::unique_ptr<unsigned char[]> buffer);
+
 struct Unit {
   int number = 0;
   std::string name;
   FileForm form = FileForm::Formatted;
   bool writable = false;
   FileHandle file;
-  std::unique_ptr<unsigned char[]> buffer{new unsigned char[kBufferSize]};
+  std::unique_ptr<unsigned char[]> buffer{takeUnitBuffer()};
 
   Transfer transfer = Transfer::Idle;
   std::int64_t bufferOffset = 0;  // file offset of buffer[0]
@@ -57,7 +62,10 @@ struct Unit {
   Unit() = default;
   Unit(const Unit&) = delete;
   Unit& operator=(const Unit&) = delete;
-  ~Unit() { flushWrites(); }
+  ~Unit() {
+    flushWrites();
+    returnUnitBuffer(std::move(buffer));
+  }
 
   // The logical position: where the next record is read or written. When
   // idle it is bufferOffset, and the stream is moved there before use.

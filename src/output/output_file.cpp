@@ -14,6 +14,13 @@ std::size_t writeFile(const void* data, std::size_t size, std::FILE* file) {
 }
 int closeFile(std::FILE* file) { return std::fclose(file); }
 
+// The block of a finished output is kept for the next one: each fresh
+// megabyte costs its page faults, and a run may write a few outputs.
+std::unique_ptr<char[]>& spareBlock() {
+  static std::unique_ptr<char[]> spare;
+  return spare;
+}
+
 }  // namespace
 
 OutputFileHooks defaultOutputFileHooks() { return OutputFileHooks{openFile, writeFile, closeFile}; }
@@ -42,12 +49,14 @@ OutputFile& OutputFile::operator=(OutputFile&& other) noexcept {
 
 OutputFile::~OutputFile() {
   if (file_ != nullptr) close();
+  if (block_ && !spareBlock()) spareBlock() = std::move(block_);
 }
 
 bool OutputFile::open(const char* name, const char* mode) {
   if (file_ != nullptr) close();
   used_ = 0;
   failed_ = false;
+  if (!block_) block_ = std::move(spareBlock());
   if (!block_) {
     block_.reset(new (std::nothrow) char[kBlockSize]);
     if (!block_) return false;
