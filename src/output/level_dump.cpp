@@ -36,6 +36,7 @@
 #include "fileio/little_endian.h"
 #include "output/outline_check.h"
 #include "output/outline_list.h"
+#include "output/lost_output.h"
 #include "output/output_file.h"
 
 namespace pc {
@@ -132,10 +133,13 @@ int writeLevelDump(ZLevel* levels, std::int32_t levelCount) {
   OutputFile file;
   if (!file.open(name, kLevelDumpMode)) return -1;
   writeHeader(file, -1, -1, -1);
+  // The dump's file is there but some of it could not be written (a full
+  // disk): the dump is lost, and the run must not end as a success.
   if (!file.flush()) {
     file.close();
-    return -1;
+    reportLostOutput(name, kLevelDumpMode);
   }
+  bool lost = false;
 
   CheckedArray<Point> outline(kOutlineInitialCapacity, kOutlineGrowStep);
   CheckedArray<DumpIndexEntry> index(levelCount > 0 ? levelCount : 0, 100);
@@ -164,6 +168,7 @@ int writeLevelDump(ZLevel* levels, std::int32_t levelCount) {
     }
     writeLevelRecords(file, outer, outline);
     if (!file.flush()) {
+      lost = true;
       file.clearError();
       misplaced = true;
       continue;
@@ -193,7 +198,8 @@ int writeLevelDump(ZLevel* levels, std::int32_t levelCount) {
     finished = false;
   }
   if (!file.close()) finished = false;
-  return finished ? result : -1;
+  if (lost || !finished) reportLostOutput(name, kLevelDumpMode);
+  return result;
 }
 
 }  // namespace pc

@@ -12,9 +12,10 @@ inline constexpr const char* kLevelDumpName = "$TMP/wlevel.tmp";
 inline constexpr const char* kLevelDumpMode = "w+b";
 
 // Writes the dump of `levels[0..levelCount)`. 1 on success; -1 when the name
-// cannot be expanded, the file cannot be created, an outline fails the
-// outline check (the levels before it stay indexed) or the index or header
-// cannot be written. A failed dump does not stop the run.
+// cannot be expanded, the file cannot be created or an outline fails the
+// outline check (the levels before it stay indexed); such a dump does not
+// stop the run. A dump whose file was created but could not be completely
+// written (a full disk) ends the run through reportLostOutput.
 int writeLevelDump(ZLevel* levels, std::int32_t levelCount);
 
 }  // namespace pc

@@ -6,6 +6,7 @@
 
 #include <cstdint>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <deque>
 #include <filesystem>
@@ -335,30 +336,35 @@ TEST_F(Outputs, LevelDumpHasTheOuterContoursWithTheirIslandsUntilAnOpenContour) 
                                        indexEntry(1, 10, 12 + 24 * 30, 2.0) + pack(0, 1));
 }
 
-TEST_F(Outputs, LevelDumpLevelWhoseRecordsCannotBeWrittenLosesOnlyItsIndexEntry) {
+// A dump whose file was made but not completely written is a lost output:
+// its report and status -1, after the dump went on as far as it could (a
+// level whose records failed loses only its index entry). A dump whose file
+// cannot be made at all lets the run go on.
+TEST_F(Outputs, LevelDumpThatCannotBeCompletelyWrittenIsLost) {
+  const std::string lost = "*** Cannot open file " + dir.file("wlevel.tmp") + " in mode w+b.\n";
+  const auto dump = [&](std::int32_t levelCount, int failing) {
+    writeCalls = 0;
+    failingWriteCall = failing;
+    outputFileHooks().write = failOneWrite;
+    std::fflush(stdout);
+    ::dup2(2, 1);  // the report goes to standard output, death tests see standard error
+    writeLevelDump(levels.data(), levelCount);
+    std::exit(0);
+  };
   for (std::size_t i = 0; i < 3; ++i) add(i, square(0, 0, 10.0f + static_cast<float>(i)), static_cast<float>(i));
-  writeCalls = 0;
-  failingWriteCall = 3;  // header, level 0, then level 1 fails
-  outputFileHooks().write = failOneWrite;
-  console([&] { return writeLevelDump(levels.data(), 3); });
-  EXPECT_EQ(result, 1);
+  EXPECT_EXIT(dump(3, 3), testing::ExitedWithCode(255), testing::Eq(lost));  // header, level 0, then level 1 fails
   // Level 2 at its own offset, after the hole level 1 left.
   EXPECT_EQ(written("wlevel.tmp"), pack(2, 18, 0) + outline(square(0, 0, 10)) + std::string(24 * 6, '\0') +
                                        outline(square(0, 0, 12)) + indexEntry(0, 6, 12, 0.0) +
                                        indexEntry(2, 6, 12 + 24 * 12, 2.0) + pack(0, 2));
-}
-
-TEST_F(Outputs, LevelDumpFailingBeforeTheRecordsOrInTheIndexGivesMinusOne) {
-  add(0, square(0, 0, 10), 1.0f);
-  for (int failing : {0, 1, 3}) {  // no file; no header; header and level 0 but no index
-    writeCalls = 0;
-    failingWriteCall = failing;
-    outputFileHooks().open = failing == 0 ? refuseOpen : defaultOutputFileHooks().open;
-    outputFileHooks().write = failOneWrite;
-    console([&] { return writeLevelDump(levels.data(), 1); });
-    EXPECT_EQ(result, -1) << failing;
-    EXPECT_EQ(written("wlevel.tmp"), failing == 3 ? pack(-1, -1, -1) + outline(square(0, 0, 10)) : "") << failing;
+  for (int failing : {1, 3}) {  // the header; the index
+    EXPECT_EXIT(dump(1, failing), testing::ExitedWithCode(255), testing::Eq(lost)) << failing;
   }
+  EXPECT_EQ(written("wlevel.tmp"), pack(-1, -1, -1) + outline(square(0, 0, 10)));
+
+  outputFileHooks().open = refuseOpen;
+  console([&] { return writeLevelDump(levels.data(), 1); });
+  EXPECT_EQ(result, -1);
 }
 
 }  // namespace
