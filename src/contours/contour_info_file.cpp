@@ -1,12 +1,3 @@
-// Record layout of the contour information file, inside the unformatted
-// framing of the record runtime (fileio/record_runtime.cpp):
-//
-//   offset in data  size  type                            meaning
-//   0               4     float32, little-endian          x
-//   4               4     float32, little-endian          y
-//   8               4     float32, little-endian          z
-//
-// No header, no trailer record. A longer record yields its first 12 bytes.
 #include "contours/contour_info_file.h"
 
 #include <cmath>
@@ -20,7 +11,6 @@ namespace pc {
 namespace {
 
 constexpr char kContourInfoName[] = "$TMP/trxcon.inf";
-constexpr std::size_t kRecordBytes = 12;
 constexpr double kZChange = 0.0001;
 constexpr double kNoPreviousZ = 999999999.0;
 
@@ -33,11 +23,9 @@ int openContourInfoFile(int& unit) {
 }
 
 int readContourRecord(int unit, float& x, float& y, float& z) {
-  unsigned char data[kRecordBytes];
-  if (fileio::readRecord(unit, data, kRecordBytes) != fileio::kIoOk) return 1;
-  x = fileio::loadFloatLE(data);
-  y = fileio::loadFloatLE(data + 4);
-  z = fileio::loadFloatLE(data + 8);
+  unsigned char data[kContourInfoRecordBytes];
+  if (fileio::readRecord(unit, data, kContourInfoRecordBytes) != fileio::kIoOk) return 1;
+  decodeContourInfoRecord(data, x, y, z);
   return 0;
 }
 

@@ -1,9 +1,23 @@
 // The contour information file "$TMP/trxcon.inf": the Z-level contours of the
 // current tool as one sequence of (x, y, z) records in which separator
 // records end the contours.
+//
+// Record layout, inside the unformatted framing of the record runtime
+// (fileio/record_runtime.cpp):
+//
+//   offset in data  size  type                            meaning
+//   0               4     float32, little-endian          x
+//   4               4     float32, little-endian          y
+//   8               4     float32, little-endian          z
+//
+// No header, no trailer record. A longer record yields its first 12 bytes;
+// a shorter one is a failed read.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
+
+#include "fileio/little_endian.h"
 
 namespace pc {
 
@@ -16,6 +30,15 @@ inline bool isContourPoint(float x, float y, float z) {
   const double dx = x, dy = y, dz = z;
   return dx < kContourRecordLimit && dx > -kContourRecordLimit && dy < kContourRecordLimit &&
          dy > -kContourRecordLimit && dz < kContourRecordLimit && dz > -kContourRecordLimit;
+}
+
+inline constexpr std::size_t kContourInfoRecordBytes = 12;
+
+// The three values of a record's first 12 data bytes.
+inline void decodeContourInfoRecord(const unsigned char* data, float& x, float& y, float& z) {
+  x = fileio::loadFloatLE(data);
+  y = fileio::loadFloatLE(data + 4);
+  z = fileio::loadFloatLE(data + 8);
 }
 
 // Takes a free unit and opens the file on it, as an existing unformatted

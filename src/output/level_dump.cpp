@@ -1,33 +1,6 @@
-// Level dump, binary, little-endian:
-//
-// Header, at offset 0 (written as three -1 first, rewritten at the end):
-//   offset  size  type    meaning
-//   0       4     int32   number of index entries (levels written)
-//   4       4     int32   number of point records counted (R)
-//   8       4     int32   1 while every index entry k describes level k, else 0
-//
-// Point records from offset 12, level after level, 24 bytes each:
-//   0       4     int32   kind: 1 point, 0 separator
-//   4       4     -       padding, zero
-//   8       8     double  x
-//   16      8     double  y
-//
-// Index at 12 + 24 * R, one 32-byte entry per level written:
-//   0       4     int32   level number (position in the level array)
-//   4       4     int32   number of point records of the level
-//   8       4     int32   the same number
-//   12      4     int32   offset of the level's first point record
-//   16      4     int32   the same number of records
-//   20      4     -       padding, zero
-//   24      8     double  Z of the level's last outer contour
-//
-// Level list after the index: one int32 level number per index entry.
-//
-// A level whose records could not be written gets no index entry but still
-// counts in R, so every offset stays that of a complete file; the next level
-// is written at its own offset.
 #include "output/level_dump.h"
 
+#include <bit>
 #include <cstring>
 #include <limits>
 
@@ -125,6 +98,97 @@ void writeLevelRecords(OutputFile& file, const CheckedArray<ContourNode*>& outer
 }
 
 }  // namespace
+
+bool LevelDumpReader::fail(std::int64_t offset, std::int64_t record, std::string expected) {
+  problem_ = fileio::ReadProblem{offset, record, std::move(expected)};
+  return false;
+}
+
+bool LevelDumpReader::open(const std::string& path) {
+  index_.clear();
+  levelList_.clear();
+  if (!stream_.open(path)) return fail(0, 0, "a readable file");
+  unsigned char bytes[kIndexEntrySize];
+  if (stream_.read(bytes, kHeaderSize) < kHeaderSize) return fail(0, 0, "a 12-byte header, the file is shorter");
+  header_ = LevelDumpHeader{fileio::loadInt32LE(bytes), fileio::loadInt32LE(bytes + 4),
+                            fileio::loadInt32LE(bytes + 8)};
+  if (header_.entries == -1 && header_.records == -1 && header_.ordered == -1) {
+    return fail(0, 0, "a finished header, found -1 -1 -1 (the dump never ended)");
+  }
+  if (header_.entries < 0 || header_.records < 0 || (header_.ordered != 0 && header_.ordered != 1)) {
+    return fail(0, 0, "entries >= 0, records >= 0 and an order flag of 0 or 1, found " +
+                          std::to_string(header_.entries) + " " + std::to_string(header_.records) + " " +
+                          std::to_string(header_.ordered));
+  }
+  const std::int64_t indexStart = kHeaderSize + kRecordSize * header_.records;
+  const std::int64_t expectedSize = indexStart + (kLevelDumpIndexBytes + 4) * header_.entries;
+  if (stream_.size() != expectedSize) {
+    return fail(stream_.size() < expectedSize ? stream_.size() : expectedSize, 0,
+                "a file of 12 + 24 x " + std::to_string(header_.records) + " + 36 x " +
+                    std::to_string(header_.entries) + " = " + std::to_string(expectedSize) + " bytes, found " +
+                    std::to_string(stream_.size()));
+  }
+  if (!stream_.seek(indexStart)) return fail(indexStart, 0, "the index, the file cannot be positioned there");
+  index_.reserve(static_cast<std::size_t>(header_.entries));
+  for (std::int32_t k = 0; k < header_.entries; ++k) {
+    const std::int64_t at = stream_.offset();
+    if (stream_.read(bytes, kIndexEntrySize) < kIndexEntrySize) return fail(at, k + 1, "a 32-byte index entry");
+    LevelDumpIndexEntry e{fileio::loadInt32LE(bytes), fileio::loadInt32LE(bytes + 4), fileio::loadInt32LE(bytes + 12),
+                          std::bit_cast<double>(static_cast<std::uint64_t>(fileio::loadLE32(bytes + 24)) |
+                                                static_cast<std::uint64_t>(fileio::loadLE32(bytes + 28)) << 32)};
+    if (fileio::loadInt32LE(bytes + 8) != e.records || fileio::loadInt32LE(bytes + 16) != e.records) {
+      return fail(at, k + 1, "the same record count three times in the index entry");
+    }
+    const std::int64_t end = static_cast<std::int64_t>(e.offset) + kRecordSize * e.records;
+    if (e.records < 0 || e.offset < kHeaderSize || (e.offset - kHeaderSize) % kRecordSize != 0 || end > indexStart) {
+      return fail(at, k + 1, "records inside the record area (offset " + std::to_string(e.offset) + ", " +
+                                 std::to_string(e.records) + " records)");
+    }
+    index_.push_back(e);
+  }
+  for (std::int32_t k = 0; k < header_.entries; ++k) {
+    const std::int64_t at = stream_.offset();
+    if (stream_.read(bytes, 4) < 4) return fail(at, k + 1, "a 4-byte level number of the level list");
+    levelList_.push_back(fileio::loadInt32LE(bytes));
+    if (levelList_.back() != index_[static_cast<std::size_t>(k)].level) {
+      return fail(at, k + 1, "the level number " + std::to_string(index_[static_cast<std::size_t>(k)].level) +
+                                 " of index entry " + std::to_string(k + 1) + ", found " +
+                                 std::to_string(levelList_.back()));
+    }
+  }
+  return true;
+}
+
+bool LevelDumpReader::startEntry(std::size_t k) {
+  if (k >= index_.size()) return false;
+  const LevelDumpIndexEntry& e = index_[k];
+  if (!stream_.seek(e.offset)) return fail(e.offset, 0, "the level's records, the file cannot be positioned there");
+  recordNumber_ = (e.offset - kHeaderSize) / kRecordSize;
+  entryLeft_ = e.records;
+  return true;
+}
+
+fileio::RecordRead LevelDumpReader::nextRecord(LevelDumpRecord& record) {
+  if (entryLeft_ <= 0) return fileio::RecordRead::End;
+  const std::int64_t at = stream_.offset();
+  ++recordNumber_;
+  unsigned char bytes[kRecordSize];
+  if (stream_.read(bytes, kRecordSize) < kRecordSize) {
+    fail(at, recordNumber_, "a 24-byte point record, the file ends first");
+    return fileio::RecordRead::Damaged;
+  }
+  --entryLeft_;
+  auto loadDouble = [](const unsigned char* p) {
+    return std::bit_cast<double>(static_cast<std::uint64_t>(fileio::loadLE32(p)) |
+                                 static_cast<std::uint64_t>(fileio::loadLE32(p + 4)) << 32);
+  };
+  record = LevelDumpRecord{fileio::loadInt32LE(bytes), loadDouble(bytes + 8), loadDouble(bytes + 16)};
+  if (record.kind != 0 && record.kind != 1) {
+    fail(at, recordNumber_, "a record kind of 1 (point) or 0 (separator), found " + std::to_string(record.kind));
+    return fileio::RecordRead::Damaged;
+  }
+  return fileio::RecordRead::Record;
+}
 
 int writeLevelDump(ZLevel* levels, std::int32_t levelCount) {
   char name[512];

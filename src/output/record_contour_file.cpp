@@ -1,13 +1,3 @@
-// Record contour file: a sequential unformatted file (each record framed by
-// its byte count as a little-endian int32 before and after the data), one
-// record of 18 data bytes per outline entry and a final separator record:
-//
-//   offset  size  type     point record      separator record
-//   0       4     float32  x                 99999.0
-//   4       4     float32  y                 99999.0
-//   8       4     float32  Z of the pocket   99999.0
-//   12      4     int32    -1003             -1001
-//   16      2     int16    1                 0
 #include "output/record_contour_file.h"
 
 #include <cstring>
@@ -25,7 +15,7 @@ namespace pc {
 
 namespace {
 
-constexpr std::size_t kRecordSize = 18;
+constexpr std::size_t kRecordSize = kContourRecordBytes;
 constexpr int kCreateNewFile = 2;
 
 int defaultFreeUnit() { return fileio::freeUnit(); }

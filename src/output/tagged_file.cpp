@@ -1,19 +1,6 @@
-// Tagged record file, binary, little-endian, no padding:
-//
-//   offset  size  type     meaning
-//   0       4     int32    byte-order mark, 256 (bytes 00 01 00 00)
-//   4       ...            records back to back, each a tag byte and its payload:
-//
-//   tag    payload                                           size
-//   b, p   a float32, b float32                              1 + 8
-//   c, r   a int32, b int32 (truncated toward zero)          1 + 8
-//   d, m   a int32 (truncated toward zero)                   1 + 4
-//   e, n   a float32, b int32 (truncated toward zero)        1 + 8
-//   f      a float32                                         1 + 4
-//
-// Integer fields of values outside the int32 range saturate; NaN gives 0.
 #include "output/tagged_file.h"
 
+#include <bit>
 #include <cstring>
 
 #include "driver/float_truncation.h"
@@ -93,6 +80,81 @@ void writeContours(TaggedFile& file, const Point* points, std::int32_t count) {
     }
   }
   if (inRun) writeTaggedRecord(file, 'f', 0.0f, 0.0f);
+}
+
+std::size_t taggedPayloadSize(char tag) {
+  switch (tag) {
+    case 'b': case 'p': case 'c': case 'r': case 'e': case 'n': return 8;
+    case 'd': case 'm': case 'f': return 4;
+    default: return 0;
+  }
+}
+
+namespace {
+
+std::uint32_t loadWord(const unsigned char* p, bool swap) {
+  const std::uint32_t v = fileio::loadLE32(p);
+  return swap ? (v >> 24) | ((v >> 8) & 0xFF00u) | ((v << 8) & 0xFF0000u) | (v << 24) : v;
+}
+float loadFloat(const unsigned char* p, bool swap) { return std::bit_cast<float>(loadWord(p, swap)); }
+std::int32_t loadInt(const unsigned char* p, bool swap) { return std::bit_cast<std::int32_t>(loadWord(p, swap)); }
+
+}  // namespace
+
+bool TaggedFileReader::open(const std::string& path) {
+  number_ = 0;
+  if (!stream_.open(path)) {
+    problem_ = fileio::ReadProblem{0, 0, "a readable file"};
+    return false;
+  }
+  unsigned char mark[4];
+  if (stream_.read(mark, sizeof mark) < sizeof mark) {
+    problem_ = fileio::ReadProblem{0, 0, "the 4-byte byte-order mark 256, the file is shorter"};
+    return false;
+  }
+  if (loadWord(mark, false) == static_cast<std::uint32_t>(kByteOrderMark)) {
+    swap_ = false;
+  } else if (loadWord(mark, true) == static_cast<std::uint32_t>(kByteOrderMark)) {
+    swap_ = true;
+  } else {
+    problem_ = fileio::ReadProblem{0, 0, "the byte-order mark 256 (00 01 00 00)"};
+    return false;
+  }
+  return true;
+}
+
+fileio::RecordRead TaggedFileReader::next(TaggedRecord& record) {
+  record = TaggedRecord{};
+  record.offset = stream_.offset();
+  unsigned char bytes[kLargestRecord];
+  if (stream_.read(bytes, 1) == 0) {
+    if (!stream_.failed()) return fileio::RecordRead::End;
+    problem_ = fileio::ReadProblem{record.offset, number_ + 1, "a tag byte, the system failed the read"};
+    return fileio::RecordRead::Damaged;
+  }
+  ++number_;
+  record.tag = static_cast<char>(bytes[0]);
+  const std::size_t payload = taggedPayloadSize(record.tag);
+  if (payload == 0) {
+    problem_ = fileio::ReadProblem{record.offset, number_,
+                                   "a tag letter b p c r d m e n f, found byte " + std::to_string(bytes[0])};
+    return fileio::RecordRead::Damaged;
+  }
+  if (stream_.read(bytes + 1, payload) < payload) {
+    problem_ = fileio::ReadProblem{record.offset, number_,
+                                   std::to_string(payload) + " payload bytes after tag '" +
+                                       std::string(1, record.tag) + "', the file ends first"};
+    return fileio::RecordRead::Damaged;
+  }
+  const unsigned char* p = bytes + 1;
+  switch (record.tag) {
+    case 'b': case 'p': record.a = loadFloat(p, swap_); record.b = loadFloat(p + 4, swap_); break;
+    case 'c': case 'r': record.ia = loadInt(p, swap_); record.ib = loadInt(p + 4, swap_); break;
+    case 'd': case 'm': record.ia = loadInt(p, swap_); break;
+    case 'e': case 'n': record.a = loadFloat(p, swap_); record.ib = loadInt(p + 4, swap_); break;
+    default: record.a = loadFloat(p, swap_); break;  // 'f'
+  }
+  return fileio::RecordRead::Record;
 }
 
 void closeTaggedFile(TaggedFile& file) {

@@ -80,8 +80,9 @@ bool readNumericLine(Block& block, int slot, ParamKind kind, std::string_view wi
   return true;
 }
 
-// Reads the open file into slots 1..n and gives the outcome for slot 1.
-float readSlots(int handle, Block& block, int n) {
+// Reads the open file into slots 1..n and gives the outcome for slot 1;
+// `failedLine` receives the line that failed the reading.
+float readSlots(int handle, Block& block, int n, int& failedLine) {
   if (parameterKind(n) == ParamKind::None) return 0.0f;
   if (n < 1) return static_cast<float>(n);
   for (int s = 1; s <= n; ++s) {
@@ -93,9 +94,11 @@ float readSlots(int handle, Block& block, int n) {
   const std::string_view window(line.data(), line.size());
   int status = 0;
   lineFileReadLine(handle, line, status);
+  failedLine = 1;
   if (status == kLineEnd) return static_cast<float>(n);
   if (status != kLineOk) return 0.0f;
   for (int slot = 1;; ++slot) {
+    failedLine = slot;
     const ParamKind kind = parameterKind(slot);
     if (kind == ParamKind::Text) {
       block.setText(slot, textOfLine(window));
@@ -103,6 +106,7 @@ float readSlots(int handle, Block& block, int n) {
       return 0.0f;
     }
     if (slot >= n) return static_cast<float>(n);
+    failedLine = slot + 1;
     lineFileReadLine(handle, line, status);
     if (status == kLineEnd) return static_cast<float>(n);
     if (status != kLineOk) return 0.0f;
@@ -168,23 +172,35 @@ void readToolParameters(float* values, char* texts, int textWidth, const int* sl
 
 void readToolParameters(float* values, char* texts, int textWidth, const int* slotCount,
                         const ParameterSources& sources) {
+  readToolParameters(values, texts, textWidth, slotCount, sources, ParameterFileRead{});
+}
+
+void readToolParameters(float* values, char* texts, int textWidth, const int* slotCount,
+                        const ParameterSources& sources, const ParameterFileRead& file) {
   if (values == nullptr) return;
   Block block(values, texts, textWidth);
   const int n = slotCount != nullptr ? *slotCount : 0;
 
   std::array<char, kNameField> name{};
-  toolFilePathFixed(0, name, ".par");
+  std::string_view fileName = file.fileName;
+  if (fileName.empty()) {
+    toolFilePathFixed(0, name, ".par");
+    fileName = std::string_view(name.data(), name.size());
+  }
   int handle = -1;
   int status = 0;
-  lineFileOpen(handle, std::string_view(name.data(), name.size()), 1, status);
+  int failedLine = 0;
+  lineFileOpen(handle, fileName, 1, status);
   if (status != kLineOk) {
     block.value(1) = 0.0f;
   } else {
-    block.value(1) = readSlots(handle, block, n);
+    block.value(1) = readSlots(handle, block, n, failedLine);
+    if (block.value(1) != 0.0f || n == 0) failedLine = 0;
     int closeStatus = 0;
     lineFileClose(handle, closeStatus);
   }
 
+  if (file.failedLine != nullptr) *file.failedLine = failedLine;
   addStockAllowanceIncrement(block, sources);
   applyUnitScale(block, n, sources);
 }

@@ -6,6 +6,7 @@
 #include <functional>
 #include <memory>
 #include <span>
+#include <string>
 
 namespace pc {
 
@@ -34,6 +35,14 @@ struct ParameterSources {
   std::function<int(int, std::span<char>)> zoneText;
   std::function<void(float*)> unitScale;
 };
+
+// For tools that show a given parameter file: the file, taken as it stands
+// (empty for "$TMP/outil.par"), and where the number of the line that ended
+// the reading as a failure goes (0 when none did).
+struct ParameterFileRead {
+  std::string fileName;
+  int* failedLine = nullptr;
+};
 ParameterSources defaultParameterSources();
 
 // Code of the zone record holding the stock-allowance increment.
@@ -47,6 +56,8 @@ inline constexpr int kStockAllowanceRecord = 31;
 void readToolParameters(float* values, char* texts, int textWidth, const int* slotCount);
 void readToolParameters(float* values, char* texts, int textWidth, const int* slotCount,
                         const ParameterSources& sources);
+void readToolParameters(float* values, char* texts, int textWidth, const int* slotCount,
+                        const ParameterSources& sources, const ParameterFileRead& file);
 
 // Kind of slot s (0..580); ParamKind::None outside.
 ParamKind parameterKind(int slot);

@@ -43,24 +43,29 @@ int ZoneRecordFile::find(int item, std::string_view numberedRecordCode,
   if (offset > size_) return kEndOfFile;
   for (int position = 1;; ++position) {
     if (offset == size_) return kNoRecord;
-    unsigned char recordHeader[kRecordHeaderSize];
-    if (size_ - offset < kRecordHeaderSize) return kEndOfFile;
-    if (!readAt(file_.get(), offset, recordHeader, kRecordHeaderSize)) return kEndOfFile;
-    const std::uint16_t length = recordDataLength(recordHeader, header_.order);
-    offset += kRecordHeaderSize;
-    if (size_ - offset < length) return kEndOfFile;
-    try {
-      data.resize(length);
-    } catch (const std::bad_alloc&) {
-      return kNoMemory;
-    }
-    if (length > 0 && !readAt(file_.get(), offset, data.data(), length)) return kEndOfFile;
-    offset += length;
-
+    if (const int status = readRecordAt(offset, data, offset); status != 0) return status;
     RecordKey key;
     if (const int status = decodeRecordKey(data, key); status != 0) return status;
     if (itemOfRecord(key, numberedRecordCode) == item) return position;
   }
+}
+
+int ZoneRecordFile::readRecordAt(std::uint64_t offset, std::vector<unsigned char>& data, std::uint64_t& next) {
+  if (!file_) return kCannotOpen;
+  unsigned char recordHeader[kRecordHeaderSize];
+  if (offset > size_ || size_ - offset < kRecordHeaderSize) return kEndOfFile;
+  if (!readAt(file_.get(), offset, recordHeader, kRecordHeaderSize)) return kEndOfFile;
+  const std::uint16_t length = recordDataLength(recordHeader, header_.order);
+  offset += kRecordHeaderSize;
+  if (size_ - offset < length) return kEndOfFile;
+  try {
+    data.resize(length);
+  } catch (const std::bad_alloc&) {
+    return kNoMemory;
+  }
+  if (length > 0 && !readAt(file_.get(), offset, data.data(), length)) return kEndOfFile;
+  next = offset + length;
+  return 0;
 }
 
 }  // namespace pc::zonedb

@@ -28,6 +28,13 @@ class ZoneRecordFile {
   int find(int item, std::string_view numberedRecordCode, std::vector<unsigned char>& data);
 
   ByteOrder order() const { return header_.order; }
+  const ZoneFileHeader& header() const { return header_; }
+  std::uint64_t size() const { return size_; }
+
+  // Reads the record whose header starts at `offset`: its data, and in
+  // `next` the offset of the record after it. 0, kEndOfFile (cut by the end
+  // of the file) or kNoMemory.
+  int readRecordAt(std::uint64_t offset, std::vector<unsigned char>& data, std::uint64_t& next);
 
  private:
   struct Closer {

@@ -241,6 +241,37 @@ int RecordFields::readReal(float& value) {
   return 0;
 }
 
+int RecordFields::nextType(char& type) {
+  const unsigned char* bytes = nullptr;
+  const int status = nextItem(0, 0, bytes);  // type 0 matches no item: only moves to the next token
+  if (status == kWrongFieldType) {
+    type = itemType_;
+    return 0;
+  }
+  return status;
+}
+
+int RecordFields::readWord(std::int16_t& value) {
+  std::uint64_t raw = 0;
+  if (const int status = readFixed('W', raw); status != 0) return status;
+  value = static_cast<std::int16_t>(static_cast<std::uint16_t>(raw));
+  return 0;
+}
+
+int RecordFields::readLogical(bool& value) {
+  std::uint64_t raw = 0;
+  if (const int status = readFixed('L', raw); status != 0) return status;
+  value = raw != 0;
+  return 0;
+}
+
+int RecordFields::readDouble(double& value) {
+  std::uint64_t raw = 0;
+  if (const int status = readFixed('D', raw); status != 0) return status;
+  std::memcpy(&value, &raw, sizeof value);
+  return 0;
+}
+
 int RecordFields::readText(std::string& value) {
   const unsigned char* bytes = nullptr;
   if (const int status = nextItem('S', 1, bytes); status != 0) return status;

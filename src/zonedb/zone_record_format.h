@@ -73,6 +73,12 @@ class RecordFields {
   int readReal(float& value);
   // An "S" text, trailing bytes of value 1 (padding) dropped.
   int readText(std::string& value);
+  int readWord(std::int16_t& value);
+  int readLogical(bool& value);
+  int readDouble(double& value);
+  // Type letter of the next item, for readers that decode any format:
+  // 0, kBadFormat or kBeyondRecord (no item left in the format).
+  int nextType(char& type);
 
  private:
   // Moves to the next item, which must be of `type`; `bytes` then points at
