@@ -19,20 +19,22 @@ namespace pc::fuzz {
 
 // The scratch directory, made on first use: TRXZONE and TRXTMPDIR point at
 // it, so that "$TMP/x" and the zone database both name files inside it.
+// Never destroyed, so that the exit handler that removes the directory can
+// still name it.
 inline const std::string& scratchDirectory() {
-  static const std::string dir = [] {
+  static const std::string* dir = [] {
     const auto path = std::filesystem::temp_directory_path() /
                       ("pc_fuzz_" + std::to_string(platform::processId()));
     std::filesystem::create_directories(path);
+    platform::setEnv("TRXZONE", path.string());
+    platform::setEnv("TRXTMPDIR", path.string());
     std::atexit([] {
       std::error_code ignored;
       std::filesystem::remove_all(scratchDirectory(), ignored);
     });
-    platform::setEnv("TRXZONE", path.string());
-    platform::setEnv("TRXTMPDIR", path.string());
-    return path.string();
+    return new std::string(path.string());
   }();
-  return dir;
+  return *dir;
 }
 
 // The path of `name` in the scratch directory, created empty so that name
