@@ -30,6 +30,10 @@ struct MessageTable {
   std::vector<SectionIndex> indexes;
   std::unordered_map<std::string, int> sectionNumbers;  // name to first section
   bool indexesUsable = true;  // false after the index ran out of memory: plain scans then
+  // Values whose resolution took many steps, by entry text offset (nullopt:
+  // too large). Records never change once stored, so neither do these.
+  std::unordered_map<std::int32_t, std::optional<std::string>> resolved;
+  std::size_t resolvedBytes = 0;
 };
 
 namespace table_layout {

@@ -27,6 +27,10 @@ constexpr std::size_t stepLimit = 1u << 20;
 constexpr std::size_t tracedSteps = 1000;
 constexpr std::size_t tracedCharacters = 1u << 22;
 constexpr std::size_t referenceLength = 12;  // "+(XXXXXXXX\)"
+// Resolutions of more steps than this are kept for the next lookup of the
+// same entry, up to a total size; a hostile file may ask for them often.
+constexpr std::size_t keptFromSteps = 1000;
+constexpr std::size_t keptBytes = 16u << 20;
 
 // The process-wide result of the latest lookup that resolved references,
 // and the entry it came from.
@@ -79,6 +83,8 @@ class Resolver {
     }
     return true;
   }
+
+  std::size_t steps() const { return steps_; }
 
  private:
   bool traced() const { return trace_ && untracedFrom_ == 0; }
@@ -189,13 +195,30 @@ std::optional<Found> resolve(MessageTable* table, int section, std::string_view 
   const std::int32_t entry = slotText(pool, slot);
   const std::string_view value = entryValue(storedText(table, entry));
   if (value.find('+') == std::string_view::npos) return Found{value.data(), entry};
+  const std::string label = std::string(sectionName(table, section)) + "] " + std::string(key);
   try {
-    Resolver resolver(table, entry);
-    if (!resolver.run(resultBuffer)) {
+    const auto kept = table->resolved.find(entry);
+    bool resolved = false;
+    if (kept != table->resolved.end()) {
+      resolved = kept->second.has_value();
+      if (resolved) resultBuffer = *kept->second;
+    } else {
+      Resolver resolver(table, entry);
+      resolved = resolver.run(resultBuffer);
+      if (resolver.steps() > keptFromSteps) {
+        if (table->resolvedBytes > keptBytes) {
+          table->resolved.clear();
+          table->resolvedBytes = 0;
+        }
+        table->resolved.emplace(entry, resolved ? std::optional<std::string>(resultBuffer) : std::nullopt);
+        table->resolvedBytes += resolved ? resultBuffer.size() : 0;
+      }
+    }
+    if (!resolved) {
       resultBuffer.clear();
       resultTable = nullptr;
-      warning("Message table: the value of [" + std::string(sectionName(table, section)) + "] " + std::string(key) +
-              " passes " + std::to_string(resolvedLimit) + " bytes once resolved; it is taken as undefined");
+      warning("Message table: the value of [" + label + " passes " + std::to_string(resolvedLimit) +
+              " bytes once resolved; it is taken as undefined");
       return std::nullopt;
     }
   } catch (const std::bad_alloc&) {
