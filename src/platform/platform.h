@@ -52,6 +52,15 @@ DirectoryCreation createDirectory(const std::string& name);
 // suite's installation layout (<home>/exe/<this>/<program>).
 const char* platformDirectoryName();
 
+// The variable that the configuration sets to 1 for this platform, so that
+// the suite's files can test for it ("LINUX" here, "WINDOWS" on Windows).
+const char* platformConfigurationVariable();
+
+// Converts the `length` UTF-8 bytes at `text` to the process code page in
+// place, keeping at most `size` - 1 bytes and a NUL; gives the new length.
+// The identity where the code page is UTF-8.
+std::size_t utf8ToProcessCodePage(char* text, std::size_t length, std::size_t size);
+
 // Stops a process running under a debugger here. Without a debugger the
 // process ends abnormally (SIGTRAP on POSIX systems).
 void breakpointTrap();

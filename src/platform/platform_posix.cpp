@@ -103,6 +103,15 @@ DirectoryCreation createDirectory(const std::string& name) {
 
 const char* platformDirectoryName() { return "linux"; }
 
+const char* platformConfigurationVariable() { return "LINUX"; }
+
+std::size_t utf8ToProcessCodePage(char* text, std::size_t length, std::size_t size) {
+  if (text == nullptr || size == 0) return 0;
+  if (length >= size) length = size - 1;
+  text[length] = '\0';
+  return length;
+}
+
 void breakpointTrap() { std::raise(SIGTRAP); }
 
 std::int64_t currentTime() { return static_cast<std::int64_t>(std::time(nullptr)); }
