@@ -17,7 +17,6 @@
 #include "driver/fatal_report.h"
 #include "driver/float_truncation.h"
 #include "driver/run_mode.h"
-#include "env/configuration_loader.h"
 #include "env/path_expander.h"
 #include "output/contour_file_rewrite.h"
 #include "output/level_dump.h"
@@ -203,8 +202,6 @@ void removeStaleOffsetError() {
 
 int runPocketClassifier(int argc, char** argv) {
   std::setvbuf(stdout, nullptr, _IONBF, 0);
-  // Variables missing from the environment come from the suite's environ.cfg files.
-  installConfigurationLoader();
   printBanner();
 
   RunMode mode = runModeFromArguments(argc, argv);

@@ -13,7 +13,15 @@ extern char** environ;
 
 namespace pc::test {
 
-WorkZone::WorkZone() { std::filesystem::create_directories(tmp()); }
+void writeInstallation(const std::string& home, const std::string& environ) {
+  std::filesystem::create_directories(home + "/config");
+  writeFile(home + "/config/environ.cfg", environ);
+}
+
+WorkZone::WorkZone() {
+  std::filesystem::create_directories(tmp());
+  writeInstallation(home());
+}
 
 void WorkZone::writeParameters(const std::vector<std::pair<int, std::string>>& lines) const {
   std::map<int, std::string> bySlot(lines.begin(), lines.end());
@@ -30,7 +38,7 @@ void WorkZone::writeContours(const std::vector<std::vector<float>>& records) con
 }
 
 RunResult WorkZone::run(const std::vector<std::string>& args, const std::vector<std::string>& extraEnv) const {
-  std::vector<std::string> env{"TRXZONE=" + zone(), "TRXTMPDIR=" + tmp()};
+  std::vector<std::string> env{"TRXHOME=" + home(), "TRXZONE=" + zone(), "TRXTMPDIR=" + tmp()};
   env.insert(env.end(), extraEnv.begin(), extraEnv.end());
   return runProgram(args, env, zone());
 }
@@ -47,13 +55,24 @@ RunResult runProgram(const std::vector<std::string>& args, const std::vector<std
   }
   for (const auto& e : extraEnv) env.push_back(e);
 
+  // Standard error goes to a file, so that neither stream can fill up while
+  // the other is read.
+  char errName[] = "/tmp/pc-e2e-err-XXXXXX";
+  const int errFd = mkstemp(errName);
+  if (errFd < 0) return {};
+  unlink(errName);
   int pipeFds[2];
-  if (pipe(pipeFds) != 0) return {};
+  if (pipe(pipeFds) != 0) {
+    close(errFd);
+    return {};
+  }
   const pid_t pid = fork();
   if (pid == 0) {
     close(pipeFds[0]);
     dup2(pipeFds[1], STDOUT_FILENO);
+    dup2(errFd, STDERR_FILENO);
     close(pipeFds[1]);
+    close(errFd);
     if (chdir(cwd.c_str()) != 0) _exit(127);
     std::vector<char*> argv{const_cast<char*>(PC_EXECUTABLE)};
     for (const auto& a : args) argv.push_back(const_cast<char*>(a.c_str()));
@@ -73,6 +92,9 @@ RunResult runProgram(const std::vector<std::string>& args, const std::vector<std
   int status = 0;
   waitpid(pid, &status, 0);
   if (WIFEXITED(status)) result.exitStatus = WEXITSTATUS(status);
+  lseek(errFd, 0, SEEK_SET);
+  while ((n = read(errFd, buffer, sizeof buffer)) > 0) result.err.append(buffer, static_cast<size_t>(n));
+  close(errFd);
   return result;
 }
 

@@ -23,6 +23,7 @@ struct Installation {
   }
   Installation() {
     fs::create_directories(home() + "/client/trxconf");
+    writeInstallation(home());
     fs::create_directories(zone());
     fs::create_directories(tmpRoot());
   }
