@@ -35,6 +35,7 @@ Measure runProgram(const std::string& dir, const char* mode) {
   const auto start = Clock::now();
   const pid_t pid = fork();
   if (pid == 0) {
+    setenv("TRXHOME", PC_BENCH_INSTALLATION, 1);
     setenv("TRXTMPDIR", dir.c_str(), 1);
     setenv("TRXZONE", dir.c_str(), 1);
     if (chdir(dir.c_str()) != 0) _exit(127);

@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
-# Runs the pocket classifier on a copy of the bundled work zone, in every
-# output mode, and shows what each run wrote. The repository stays clean.
+# Runs the pocket classifier on a copy of the bundled work zone, inside the
+# bundled installation (TRXHOME) and its user layer, in every output mode,
+# and shows what each run wrote. The repository stays clean.
 #   examples/demo.sh <pocket-classifier executable>
 set -euo pipefail
 exe=$(realpath "$1")
@@ -9,9 +10,14 @@ work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
 cp -r "$here/zone" "$work/zone"
+export TRXHOME="$here/installation"
 export TRXZONE="$work/zone"
 export TRXTMPDIR="$work/zone/tmp"
 cd "$work/zone"
+
+echo "==== configuration layers (TRX_TRXFILES_VERBOSE=on) ===="
+TRX_TRXFILES_VERBOSE=on "$exe" R | grep -E "^(LOADING|loading|Overloading|TRXUNITS = )" || true
+rm -f poches.res
 
 run() {
   echo "==== pocket-classifier $* ===="

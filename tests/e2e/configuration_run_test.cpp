@@ -99,6 +99,21 @@ TEST(ConfigurationRun, VerboseRunTracesTheLayersAndTheOrigins) {
   EXPECT_EQ(r.out.substr(expectedBanner().size(), trace.size()), trace) << r.out;
 }
 
+TEST(ConfigurationRun, TheExampleInstallationLoadsBothItsLayers) {
+  WorkZone wz;
+  const std::string home = std::string(PC_EXAMPLES_DIR) + "/installation";
+  const RunResult r = runProgram({"x"}, {"TRXHOME=" + home, "TRXTMPDIR=" + wz.tmp(), "TRX_TRXFILES_VERBOSE=on"},
+                                 wz.zone());
+  EXPECT_EQ(r.exitStatus, 0) << r.out;
+  EXPECT_NE(r.out.find("LOADING ENVIRONMENT FILES ....\n"
+                       "loading configuration file '" + home + "/config/environ.cfg'\n"),
+            std::string::npos) << r.out;
+  EXPECT_NE(r.out.find("loading configuration file '" + home + "/../user/environ.cfg'\n"), std::string::npos);
+  EXPECT_NE(r.out.find("TRXUNITS = 'metric' from '" + home + "/config/environ.cfg' line 4\n"), std::string::npos);
+  // Verbose: warnings would be on standard output, and there are none.
+  EXPECT_EQ(r.out.find("load_messages"), std::string::npos) << r.out;
+}
+
 TEST(ConfigurationRun, EachFatalMessageEndsTheRunWithStatus255) {
   struct Case {
     std::string environ;  // the installation's file; "" for none
