@@ -1,5 +1,6 @@
 #include "synthetic/synthetic_part.h"
 
+#include <algorithm>
 #include <cmath>
 #include <cstdio>
 #include <cstring>
@@ -70,7 +71,8 @@ void writeLoop(RecordSink& sink, std::mt19937& rng, double cx, double cy, double
 }  // namespace
 
 std::int64_t pointCount(const PartShape& shape) {
-  return std::int64_t{shape.levels} * shape.pockets * (1 + shape.islands) * shape.pointsPerContour;
+  return std::int64_t{shape.levels} * shape.pockets * (std::max(1, shape.rings) + shape.islands) *
+         shape.pointsPerContour;
 }
 
 bool writeSyntheticPart(const PartShape& shape, const std::string& path) {
@@ -87,8 +89,14 @@ bool writeSyntheticPart(const PartShape& shape, const std::string& path) {
     for (std::int32_t p = 0; p < shape.pockets; ++p) {
       const double cx = pitch * (p % columns);
       const double cy = pitch * (p / columns);
-      const double radius = 0.45 * pitch * depthFactor;
-      writeLoop(sink, rng, cx, cy, radius, z, shape.pointsPerContour);
+      const double outerRadius = 0.45 * pitch * depthFactor;
+      // Each ring a little inside the one around it; islands sit in the last.
+      const std::int32_t rings = std::max(1, shape.rings);
+      double radius = outerRadius;
+      for (std::int32_t r = 0; r < rings; ++r) {
+        radius = outerRadius * (1.0 - 0.6 * r / rings);
+        writeLoop(sink, rng, cx, cy, radius, z, shape.pointsPerContour);
+      }
       for (std::int32_t k = 0; k < shape.islands; ++k) {
         const double angle = 2.0 * kPi * k / std::max(1, shape.islands);
         const double ring = shape.islands == 1 ? 0.0 : 0.5 * radius;

@@ -1,6 +1,7 @@
 // A seeded generator of synthetic multi-level contour information files:
 // levels x pockets x islands x points per contour, pockets that shrink with
-// depth like a machined cavity, islands inside every pocket.
+// depth like a machined cavity, islands inside every pocket (inside the
+// innermost of its rings when a pocket has several).
 #pragma once
 
 #include <cstdint>
@@ -14,6 +15,7 @@ struct PartShape {
   std::int32_t islands = 2;             // islands per pocket
   std::int32_t pointsPerContour = 100;  // closing point included
   std::uint32_t seed = 1;
+  std::int32_t rings = 1;               // concentric contours per pocket, nested inside each other
 };
 
 // Total number of point records the shape produces (separators excluded).
