@@ -59,28 +59,24 @@ class FrameTableTest : public testing::Test {
   MessageHandler previous_ = nullptr;
 };
 
-TEST_F(FrameTableTest, IdentityViewAtUnitScaleKeepsBothIdentityFlags) {
-  ASSERT_EQ(loadView(kToolViewKind, 1.0, file("outil12.mul", kIdentityView).c_str()), 0);
-  const Frame& view = frame(kToolViewFrame);
-  EXPECT_TRUE(view.defined && view.loaded && view.matIsIdentity && view.matlecIsIdentity);
-  EXPECT_EQ(view.mat, identityMatrix());
-  EXPECT_EQ(view.inv_mat, identityMatrix());
-  EXPECT_EQ(view.name[0], '\0');  // names belong to identity definitions only
+TEST_F(FrameTableTest, IdentityViewAtUnitAndInchScales) {
+  const std::string view = file("outil12.mul", kIdentityView);
+  ASSERT_EQ(loadView(kToolViewKind, 1.0, view.c_str()), 0);
+  const Frame& f = frame(kToolViewFrame);
+  EXPECT_TRUE(f.defined && f.loaded && f.matIsIdentity && f.matlecIsIdentity);
+  EXPECT_EQ(f.mat, identityMatrix());
+  EXPECT_EQ(f.inv_mat, identityMatrix());
+  EXPECT_EQ(f.name[0], '\0');  // names belong to identity definitions only
+  resetFrameTable();
+  ASSERT_EQ(loadView(kToolViewKind, 25.4, view.c_str()), 0);
+  EXPECT_EQ(f.mat, diagonal(1.0 / 25.4, 1.0));
+  EXPECT_EQ(f.inv_mat, diagonal(25.4, 1.0));
+  EXPECT_TRUE(f.matIsIdentity);  // flagged as read, before the scale
+  EXPECT_TRUE(f.matlecIsIdentity);
   EXPECT_TRUE(warnings().empty());
 }
 
-TEST_F(FrameTableTest, ScaleDividesTheFrameAndMultipliesItsInverse) {
-  ASSERT_EQ(loadView(kToolViewKind, 25.4, file("outil12.mul", kIdentityView).c_str()), 0);
-  const Frame& view = frame(kToolViewFrame);
-  EXPECT_EQ(view.mat, diagonal(1.0 / 25.4, 1.0));
-  EXPECT_EQ(view.inv_mat, diagonal(25.4, 1.0));
-  // Flagged as read, before the scale.
-  EXPECT_TRUE(view.matIsIdentity);
-  EXPECT_TRUE(view.matlecIsIdentity);
-}
-
 TEST_F(FrameTableTest, CadAndCaoNeedNoFile) {
-  // A file of that name in the current directory is not what is read.
   for (const char* name : {"CAD", "CAO"}) {
     resetFrameTable();
     ASSERT_EQ(defineView(4, name), 0);
@@ -92,33 +88,27 @@ TEST_F(FrameTableTest, CadAndCaoNeedNoFile) {
   EXPECT_TRUE(warnings().empty());
 }
 
-TEST_F(FrameTableTest, MachineFrameIsIdentityWithoutItsFile) {
+TEST_F(FrameTableTest, MachineFrameAsIdentityAndFromItsFile) {
   ASSERT_EQ(loadView(kToolViewKind, 1.0, file("v.mul", kShiftedView).c_str()), 0);
   const Frame& machine = frame(kMachineFrame);
   EXPECT_TRUE(machine.defined && machine.loaded && machine.matIsIdentity);
   EXPECT_STREQ(machine.name.data(), machineFile().c_str());
-  // The machine frame against the shifted tool view.
+  // The identity machine frame against the shifted tool view.
   EXPECT_EQ(at(machine.matlec, 0, 3), -10.0);
   EXPECT_EQ(at(machine.matecr, 0, 3), 10.0);
   EXPECT_FALSE(machine.matlecIsIdentity);
-
   resetFrameTable();
   ASSERT_EQ(defineView(kMachineFrame, "MACHINE"), 0);
   EXPECT_STREQ(frame(kMachineFrame).name.data(), "MACHINE");
-}
 
-TEST_F(FrameTableTest, MachineFrameFromItsFile) {
   file("transfo.dat", kShiftedView);
+  resetFrameTable();
   ASSERT_EQ(loadView(kToolViewKind, 1.0, file("v.mul", kIdentityView).c_str()), 0);
-  const Frame& machine = frame(kMachineFrame);
-  EXPECT_TRUE(machine.defined && machine.loaded);
-  EXPECT_FALSE(machine.matIsIdentity);
+  EXPECT_TRUE(machine.defined && machine.loaded && !machine.matIsIdentity);
   EXPECT_EQ(machine.name[0], '\0');
-  EXPECT_EQ(at(machine.mat, 0, 3), 10.0);
   EXPECT_EQ(at(machine.inv_mat, 0, 3), -10.0);
   EXPECT_EQ(at(machine.matlec, 0, 3), 10.0);
   EXPECT_EQ(at(machine.matecr, 0, 3), -10.0);
-
   resetFrameTable();
   ASSERT_EQ(defineView(6, "MACHINE"), 0);
   EXPECT_EQ(at(frame(6).mat, 0, 3), 10.0);
@@ -173,15 +163,10 @@ TEST_F(FrameTableTest, MalformedMachineFileLeavesTheMachineFrameUnloaded) {
 }
 
 TEST(FileNames, KindsHaveTheirDefaultsAndKeys) {
-  EXPECT_STREQ(defaultFileName(kMachineAxisSystemFile), "$TRXZONE/transfo.dat");
   EXPECT_STREQ(fileNameKey(kMachineAxisSystemFile), "TARNEX_AXIS_SYSTEM");
-  EXPECT_STREQ(defaultFileName(101), "$TRXZONE/$TRXDATA/*.trn");
-  EXPECT_STREQ(fileNameKey(105), "AXIS_SYSTEM");
   EXPECT_STREQ(defaultFileName(105), "$TRXDATA/*.ref");
-  EXPECT_STREQ(fileNameKey(1016), "TOOL_VIEW");
-  EXPECT_STREQ(defaultFileName(1026), "$TRXZONE/*.hld");
+  EXPECT_STREQ(fileNameKey(1026), "HOLDER");
   EXPECT_STREQ(defaultFileName(107), "");
-  EXPECT_STREQ(fileNameKey(1009), "");
   // Nothing loads the file-names table: the defaults apply.
   EXPECT_EQ(fileKindName(kMachineAxisSystemFile), "$TRXZONE/transfo.dat");
   EXPECT_EQ(fileKindName(1027), "");
