@@ -2,6 +2,7 @@
 // they hold, the run prints at most one warning line for each and writes
 // exactly what it writes without them.
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <filesystem>
 #include <optional>
@@ -16,11 +17,15 @@ const std::string kValid = "tool view\n1 0 0 0\n0 0 1 0\n0 -1 0 0\n5 5 0 1\n1 0 
 const std::string kThreeColumns = "tool view\n1 0 0\n0 1 0\n0 0 1\n1 0 0\n0 1 0\n0 0 1\n";
 const std::string kMalformed = "tool view\n1 0 0\nnan 1 0\n";
 const std::string kDirectory = "<a directory>";
+const std::string kFifo = "<a FIFO>";
 
-// Writes `content` as `path`: nothing when absent, a directory for kDirectory.
+// Writes `content` as `path`: nothing when absent, a directory or a FIFO
+// (which must never block the run) for the markers.
 void place(const std::string& path, const std::optional<std::string>& content) {
   if (content == kDirectory)
     std::filesystem::create_directory(path);
+  else if (content == kFifo)
+    EXPECT_EQ(::mkfifo(path.c_str(), 0600), 0);
   else if (content)
     writeFile(path, *content);
 }
@@ -65,9 +70,11 @@ TEST(ToolViewRun, ViewAndMachineFilesChangeNothingButTheirMessage) {
       {kMalformed, {}, viewError},
       {"", {}, viewError},
       {kDirectory, {}, "cannot open <zone>/outil12.mul\n"},
+      {kFifo, {}, "cannot open <zone>/outil12.mul\n"},
       {kValid, kValid, ""},
       {kValid, "axes\n1e400 x\n", "read error <zone>/transfo.dat\n"},
       {kValid, kDirectory, "cannot open <zone>/transfo.dat\n"},
+      {kValid, kFifo, "cannot open <zone>/transfo.dat\n"},
       // Without a loaded view the machine file is never looked at.
       {{}, kMalformed, ""},
       {kMalformed, kMalformed, viewError},
