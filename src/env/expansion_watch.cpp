@@ -51,7 +51,7 @@ ExpanderSettings computeSettings() {
   if (auto log = platform::getEnv("TRX_EXPAND_LOGFILE_NAME")) {
     settings.logFileName = *log;
   } else if (auto temp = platform::getEnv("TEMP")) {
-    settings.logFileName = *temp + "/tarnex_expand_log.txt";
+    settings.logFileName = *temp + platform::nativeSeparator() + "tarnex_expand_log.txt";
   }
   if (auto executable = platform::executablePath()) settings.programName = baseName(*executable);
   return settings;

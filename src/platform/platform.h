@@ -2,9 +2,11 @@
 // that a Windows build only has to supply another implementation of this file.
 #pragma once
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
+#include <map>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -101,5 +103,15 @@ std::FILE* openExistingFile(const std::string& name, const char* mode, bool regu
 // A read-only stream over `size` bytes at `data`, which must outlive it;
 // nullptr when it cannot be had.
 std::FILE* openMemoryStream(const void* data, std::size_t size);
+
+// The version resource that the system itself keeps in an executable, where
+// there is one (Windows); elsewhere the build places its own section, which
+// the caller reads. `fixed` gets the thirteen fields of the fixed block,
+// `strings` those of `names` found, keyed
+// "\StringFileInfo\<language><code page>\<name>" (lower-case hexadecimal).
+enum class VersionResource { Found, Missing, Unreadable, NotNative };
+VersionResource readVersionResource(const std::string& file, const std::vector<std::string>& names,
+                                    std::array<std::uint32_t, 13>& fixed,
+                                    std::map<std::string, std::string>& strings);
 
 }  // namespace pc::platform

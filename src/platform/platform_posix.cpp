@@ -183,6 +183,11 @@ std::FILE* openMemoryStream(const void* data, std::size_t size) {
   return ::fmemopen(size == 0 ? &empty : const_cast<void*>(data), size, "rb");
 }
 
+VersionResource readVersionResource(const std::string&, const std::vector<std::string>&,
+                                    std::array<std::uint32_t, 13>&, std::map<std::string, std::string>&) {
+  return VersionResource::NotNative;
+}
+
 }  // namespace pc::platform
 
 #endif  // !_WIN32

@@ -1,5 +1,7 @@
 // The program version, read back from the version section that the build
-// places in the executable (cmake/VersionInfo.cmake writes it).
+// places in the executable (cmake/VersionInfo.cmake writes it). On Windows
+// the build writes a real version resource instead, which the platform layer
+// reads through the system; what follows is the layout of our own section.
 //
 // The executable is an ELF file; the section is found by its name,
 // ".pcversion", through the section header table. Its contents, all numbers
@@ -21,16 +23,20 @@
 #include <array>
 #include <cstdint>
 #include <cstdio>
+#include <cstring>
 #include <fstream>
 #include <limits>
 #include <optional>
 #include <string_view>
+#include <vector>
 
 #include "platform/platform.h"
 
 namespace pc {
 
 namespace {
+
+static_assert(sizeof(FixedVersionInfo) == 52, "the fixed block is copied as it is stored");
 
 constexpr std::string_view kSectionName = ".pcversion";
 constexpr std::size_t kFixedBlockSize = 52;
@@ -219,6 +225,26 @@ int readVersionInfo(const char* file, std::map<std::string, std::string>& string
     const auto own = platform::executablePath();
     if (!own) return kVersionNoFileName;
     name = *own;
+  }
+
+  // Where the system keeps a version resource of its own, the build puts
+  // the version there and the system reads it.
+  std::array<std::uint32_t, 13> nativeFixed{};
+  const std::vector<std::string> names(kStringNames.begin(), kStringNames.end());
+  switch (platform::readVersionResource(name, names, nativeFixed, strings)) {
+    case platform::VersionResource::Found:
+      if (nativeFixed[0] != kFixedVersionSignature) {
+        strings.clear();
+        return kVersionDamaged;
+      }
+      std::memcpy(&fixed, nativeFixed.data(), sizeof fixed);
+      return kVersionOk;
+    case platform::VersionResource::Missing:
+      return kVersionMissing;
+    case platform::VersionResource::Unreadable:
+      return kVersionUnreadable;
+    case platform::VersionResource::NotNative:
+      break;
   }
 
   FileBytes bytes(name);

@@ -25,7 +25,8 @@ const ZoneNames& zoneNames() {
     const std::optional<std::string> zone = platform::getEnv("TRXZONE");
     // An empty value would otherwise put the database at the root.
     const std::string directory = zone && !zone->empty() ? *zone : std::string(1, '.');
-    names = ZoneNames{directory + "/zone.inf", directory + "/zone.lck"};
+    const std::string prefix = directory + platform::nativeSeparator();
+    names = ZoneNames{prefix + "zone.inf", prefix + "zone.lck"};
   }
   return *names;
 }

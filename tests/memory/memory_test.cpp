@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "env/diagnostic_channels.h"
+#include "support/platform_conventions.h"
 #include "memory/dynamic_storage.h"
 #include "memory/tracked_memory.h"
 
@@ -122,7 +123,7 @@ TEST_F(MemoryTest, MisuseIsFatalWithTheBlockSerial) {
 TEST(MemoryDeathTest, DoubleReleaseEndsTheProcessByDefault) {
   void* block = _Wmalloc(BlockKind::Permanent, 8);
   ASSERT_EQ(_Wfree(block), 0);
-  EXPECT_EXIT(_Wfree(block), ::testing::ExitedWithCode(255), "^Trying to free previously freed memory\n$");
+  EXPECT_EXIT(_Wfree(block), ::testing::ExitedWithCode(test::platformConventions().fatalExitStatus), "^Trying to free previously freed memory\n$");
 }
 
 TEST_F(MemoryTest, HeapFailuresKeepTheBlockAndWarnExactly) {

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 #include <unistd.h>
 
+#include <cctype>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
@@ -24,6 +25,7 @@
 #include "output/record_contour_file.h"
 #include "output/tagged_file.h"
 #include "pockets/pocket_model.h"
+#include "support/platform_conventions.h"
 #include "support/test_support.h"
 
 namespace pc {
@@ -223,13 +225,16 @@ TEST_F(Outputs, PocketFormsLeaveAnEarlierFileAloneForAnEmptyListAndReplaceItOthe
     EXPECT_EQ(written(f.file), "earlier result") << k;
     EXPECT_EQ(console([&] { return f.write(list({pocket(outer, 12.7f)})); }), f.banner);
     EXPECT_EQ(result, 0);
-    EXPECT_EQ(written(f.file).size(), onePocketSizes[k]) << k;
-    EXPECT_EQ(written(f.file), f.start + f.head(12.7f) + f.contour(outer, 12.7f) + f.tail + f.end) << k;
+    // The result file is a text file: its line ends are the platform's.
+    const auto disk = [k](const std::string& text) { return k == kResult ? test::onDisk(text) : text; };
+    EXPECT_EQ(written(f.file).size(), onePocketSizes[k] +
+              (k == kResult ? 9 * (test::platformConventions().textLineEnd.size() - 1) : 0)) << k;
+    EXPECT_EQ(written(f.file), disk(f.start + f.head(12.7f) + f.contour(outer, 12.7f) + f.tail + f.end)) << k;
     console([&] { return f.write(two); });
     EXPECT_EQ(result, 0);
-    EXPECT_EQ(written(f.file), f.start + f.head(-0.5f) + f.contour(square(0, 0, 20), -0.5f) +
+    EXPECT_EQ(written(f.file), disk(f.start + f.head(-0.5f) + f.contour(square(0, 0, 20), -0.5f) +
                                    f.contour(square(2, 2, 3), -0.5f) + f.contour(square(10, 10, 4), -0.5f) + f.tail +
-                                   f.head(-7.9f) + f.contour(square(50, 0, 5), -7.9f) + f.tail + f.end)
+                                   f.head(-7.9f) + f.contour(square(50, 0, 5), -7.9f) + f.tail + f.end))
         << k;
   }
 }
@@ -242,9 +247,9 @@ TEST_F(Outputs, PocketFormsEndTheFileAfterThePocketsBeforeAnOpenContour) {
               f.banner + kBar + "*** OPEN CONTOUR (5 pts)\n*** First Point : X=0.000 Y=0.000 Z=2.000\n" +
                   "*** Last  Point : X=0.000 Y=1.000 Z=2.000\n" + kBar);
     EXPECT_EQ(result, -1);
-    EXPECT_EQ(written(f.file),
-              f.start + f.head(4.0f) + f.contour(square(0, 0, 10), 4.0f) + f.shortIsland + f.tail + f.end)
-        << f.file;
+    const std::string expected =
+        f.start + f.head(4.0f) + f.contour(square(0, 0, 10), 4.0f) + f.shortIsland + f.tail + f.end;
+    EXPECT_EQ(written(f.file), &f == &kForms[kResult] ? test::onDisk(expected) : expected) << f.file;
   }
 }
 
@@ -275,8 +280,20 @@ TEST_F(OutputsDeathTest, PocketFileThatCannotBeCreatedOrWrittenEndsTheRun) {
     ::dup2(2, 1);  // the report goes to standard output, death tests see standard error
     kForms[form].write(one);
   };
+  // Where a death test runs in a fresh process, that process has its own
+  // temporary directory: only the report's end can be known.
+  const auto report = [&](int form) -> testing::Matcher<const std::string&> {
+    if (test::platformConventions().forkedDeathTests || form == kResult) return testing::Eq(reports[form]);
+    std::string tail;  // the end from the last separator on, every punctuation mark escaped
+    for (const char ch : reports[form].substr(reports[form].rfind(test::platformConventions().separator))) {
+      if (std::ispunct(static_cast<unsigned char>(ch))) tail += '\\';
+      tail += ch;
+    }
+    return testing::ContainsRegex(tail + "$");
+  };
   for (const auto& [form, breakFile] : losses) {
-    EXPECT_EXIT(lose(form, breakFile), testing::ExitedWithCode(255), testing::Eq(reports[form]));
+    EXPECT_EXIT(lose(form, breakFile), testing::ExitedWithCode(test::platformConventions().fatalExitStatus),
+                report(form));
   }
 }
 
@@ -342,6 +359,8 @@ TEST_F(Outputs, LevelDumpHasTheOuterContoursWithTheirIslandsUntilAnOpenContour) 
 // cannot be made at all lets the run go on.
 TEST_F(Outputs, LevelDumpThatCannotBeCompletelyWrittenIsLost) {
   const std::string lost = "*** Cannot open file " + dir.file("wlevel.tmp") + " in mode w+b.\n";
+  // A death test in a fresh process cannot leave its file to this one.
+  if (!test::platformConventions().forkedDeathTests) GTEST_SKIP() << "death tests do not share this process's files";
   const auto dump = [&](std::int32_t levelCount, int failing) {
     writeCalls = 0;
     failingWriteCall = failing;
@@ -352,13 +371,13 @@ TEST_F(Outputs, LevelDumpThatCannotBeCompletelyWrittenIsLost) {
     std::exit(0);
   };
   for (std::size_t i = 0; i < 3; ++i) add(i, square(0, 0, 10.0f + static_cast<float>(i)), static_cast<float>(i));
-  EXPECT_EXIT(dump(3, 3), testing::ExitedWithCode(255), testing::Eq(lost));  // header, level 0, then level 1 fails
+  EXPECT_EXIT(dump(3, 3), testing::ExitedWithCode(test::platformConventions().fatalExitStatus), testing::Eq(lost));  // header, level 0, then level 1 fails
   // Level 2 at its own offset, after the hole level 1 left.
   EXPECT_EQ(written("wlevel.tmp"), pack(2, 18, 0) + outline(square(0, 0, 10)) + std::string(24 * 6, '\0') +
                                        outline(square(0, 0, 12)) + indexEntry(0, 6, 12, 0.0) +
                                        indexEntry(2, 6, 12 + 24 * 12, 2.0) + pack(0, 2));
   for (int failing : {1, 3}) {  // the header; the index
-    EXPECT_EXIT(dump(1, failing), testing::ExitedWithCode(255), testing::Eq(lost)) << failing;
+    EXPECT_EXIT(dump(1, failing), testing::ExitedWithCode(test::platformConventions().fatalExitStatus), testing::Eq(lost)) << failing;
   }
   EXPECT_EQ(written("wlevel.tmp"), pack(-1, -1, -1) + outline(square(0, 0, 10)));
 

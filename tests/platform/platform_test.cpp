@@ -4,6 +4,7 @@
 
 #include <ctime>
 
+#include "support/platform_conventions.h"
 #include "support/test_support.h"
 
 namespace pc::platform {
@@ -13,7 +14,8 @@ using namespace pc::test;
 
 TEST(Platform, ExecutableEnvironmentAndFiles) {
   const std::string exe = executablePath().value_or("");
-  EXPECT_EQ(exe.substr(exe.rfind('/') + 1), "test_platform");
+  EXPECT_EQ(exe.substr(exe.rfind(platformConventions().separator) + 1),
+            "test_platform" + platformConventions().executableSuffix);
   ScopedEnv guard("PC_PLATFORM_TEST_VAR", std::nullopt);
   ASSERT_TRUE(setEnv("PC_PLATFORM_TEST_VAR", ""));
   EXPECT_EQ(getEnv("PC_PLATFORM_TEST_VAR"), std::optional<std::string>(""));  // set but empty

@@ -7,12 +7,23 @@
 #include <iterator>
 #include <sstream>
 
+#include "platform/platform.h"
+
 namespace pc::test {
 
 TempDir::TempDir() {
-  std::string pattern = (std::filesystem::temp_directory_path() / "pc-test-XXXXXX").string();
-  if (::mkdtemp(pattern.data()) == nullptr) std::abort();
-  path_ = pattern;
+  // A name nobody else holds: the creation itself decides, as mkdtemp does.
+  static unsigned serial = 0;
+  const std::filesystem::path base = std::filesystem::temp_directory_path();
+  for (int attempt = 0; attempt < 1000; ++attempt) {
+    const std::string name = "pc-test-" + std::to_string(platform::processId()) + "-" + std::to_string(++serial);
+    const std::string candidate = (base / name).string();
+    if (platform::createDirectory(candidate) == platform::DirectoryCreation::created) {
+      path_ = candidate;
+      return;
+    }
+  }
+  std::abort();
 }
 
 TempDir::~TempDir() {
@@ -20,20 +31,22 @@ TempDir::~TempDir() {
   std::filesystem::remove_all(path_, ec);
 }
 
+std::string TempDir::file(const std::string& name) const { return path_ + platform::nativeSeparator() + name; }
+
 ScopedEnv::ScopedEnv(std::string name, const std::optional<std::string>& value) : name_(std::move(name)) {
   if (const char* old = std::getenv(name_.c_str())) old_ = old;
   if (value) {
-    ::setenv(name_.c_str(), value->c_str(), 1);
+    platform::setEnv(name_, *value);
   } else {
-    ::unsetenv(name_.c_str());
+    platform::unsetEnv(name_);
   }
 }
 
 ScopedEnv::~ScopedEnv() {
   if (old_) {
-    ::setenv(name_.c_str(), old_->c_str(), 1);
+    platform::setEnv(name_, *old_);
   } else {
-    ::unsetenv(name_.c_str());
+    platform::unsetEnv(name_);
   }
 }
 

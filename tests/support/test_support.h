@@ -18,7 +18,8 @@ class TempDir {
   TempDir(const TempDir&) = delete;
   TempDir& operator=(const TempDir&) = delete;
   const std::string& path() const { return path_; }
-  std::string file(const std::string& name) const { return path_ + "/" + name; }
+  // Joined with the platform's own separator, as the program writes names.
+  std::string file(const std::string& name) const;
 
  private:
   std::string path_;
