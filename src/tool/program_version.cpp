@@ -23,7 +23,6 @@
 #include <array>
 #include <cstdint>
 #include <cstdio>
-#include <cstring>
 #include <fstream>
 #include <limits>
 #include <optional>
@@ -35,8 +34,6 @@
 namespace pc {
 
 namespace {
-
-static_assert(sizeof(FixedVersionInfo) == 52, "the fixed block is copied as it is stored");
 
 constexpr std::string_view kSectionName = ".pcversion";
 constexpr std::size_t kFixedBlockSize = 52;
@@ -237,7 +234,9 @@ int readVersionInfo(const char* file, std::map<std::string, std::string>& string
         strings.clear();
         return kVersionDamaged;
       }
-      std::memcpy(&fixed, nativeFixed.data(), sizeof fixed);
+      fixed = FixedVersionInfo{nativeFixed[0], nativeFixed[1], nativeFixed[2],  nativeFixed[3],  nativeFixed[4],
+                               nativeFixed[5], nativeFixed[6], nativeFixed[7],  nativeFixed[8],  nativeFixed[9],
+                               nativeFixed[10], nativeFixed[11], nativeFixed[12]};
       return kVersionOk;
     case platform::VersionResource::Missing:
       return kVersionMissing;
