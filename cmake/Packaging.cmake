@@ -44,6 +44,8 @@ set(CPACK_DEBIAN_PACKAGE_SECTION misc)
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS OFF)
 set(CPACK_DEBIAN_PACKAGE_DEPENDS "libc6, libstdc++6")
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
+# gzip keeps making the package a matter of seconds.
+set(CPACK_DEBIAN_COMPRESSION_TYPE gzip)
 # The /usr/bin link belongs to the package only: an install into any other
 # prefix must not reach outside it.
 set(CPACK_PRE_BUILD_SCRIPTS ${PROJECT_SOURCE_DIR}/packaging/package_link.cmake)
