@@ -3,6 +3,7 @@
 set -euo pipefail
 build=$(realpath "$1")
 source_dir=$(realpath "$2")
+version=$3  # the project version the build reports
 scratch=$(mktemp -d)
 trap 'rm -rf "$scratch"' EXIT
 

@@ -21,6 +21,7 @@ outside=$(grep -v '^\./opt/' "$scratch/contents" | grep -vxF -e ./ -e ./usr/ -e 
           -e "./usr/bin/pocket-classifier -> /opt/tarnex/exe/linux/pocket-classifier" || true)
 [ -z "$outside" ] || fail "package writes outside /opt/tarnex: $outside"
 [ "$(dpkg-deb -f "$deb" Package)" = pocket-classifier ] || fail "package name"
+[ "$(dpkg-deb -f "$deb" Version)" = "$version" ] || fail "package version $(dpkg-deb -f "$deb" Version)"
 
 # The archive holds the layout itself, without the /opt prefix.
 tar tzf "$tgz" >"$scratch/archive"

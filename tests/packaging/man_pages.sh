@@ -11,4 +11,8 @@ for page in "${pages[@]}"; do
   # The page's name line is what apropos and whatis show.
   grep -q '^\.SH NAME' "$page" || fail "$page has no NAME section"
 done
+# The pages of this program name the version the build reports.
+for page in "$source_dir"/doc/*.[1-8]; do
+  grep -q "^\.TH .*\"pocket-classifier $version\"" "$page" || fail "$page does not name version $version"
+done
 echo "man_pages: ${#pages[@]} pages ok"

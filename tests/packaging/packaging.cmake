@@ -4,6 +4,6 @@
 set(pc_packaging_dir ${CMAKE_CURRENT_LIST_DIR})
 foreach(name install_run deb_package man_pages readme_examples)
   add_test(NAME packaging.${name}
-           COMMAND bash ${pc_packaging_dir}/${name}.sh ${PROJECT_BINARY_DIR} ${PROJECT_SOURCE_DIR})
+           COMMAND bash ${pc_packaging_dir}/${name}.sh ${PROJECT_BINARY_DIR} ${PROJECT_SOURCE_DIR} ${PROJECT_VERSION})
   set_tests_properties(packaging.${name} PROPERTIES RESOURCE_LOCK pc_install_tree TIMEOUT 120)
 endforeach()
