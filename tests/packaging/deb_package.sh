@@ -28,8 +28,22 @@ tar tzf "$tgz" >"$scratch/archive"
 grep -qx -e ./exe/linux/pocket-classifier -e exe/linux/pocket-classifier "$scratch/archive" \
   || fail "tar.gz lacks exe/linux/pocket-classifier"
 
+# Installed with dpkg into a throw-away root (the suite's libraries are the
+# host's, so dependencies are not checked there); without root rights only
+# unpacked.
 root=$scratch/root
-dpkg-deb -x "$deb" "$root"
+dpkg_root=(dpkg --root="$root" --force-not-root --force-depends --log=/dev/null)
+if [ "$(id -u)" = 0 ]; then
+  mkdir -p "$root/var/lib/dpkg/info" "$root/var/lib/dpkg/updates"
+  touch "$root/var/lib/dpkg/status"
+  "${dpkg_root[@]}" -i "$deb" >"$scratch/dpkg.log" 2>&1 || fail "dpkg -i: $(cat "$scratch/dpkg.log")"
+  "${dpkg_root[@]}" -L pocket-classifier >"$scratch/listed"
+  grep -qx /opt/tarnex/exe/linux/pocket-classifier "$scratch/listed" || fail "dpkg does not list the program"
+else
+  dpkg-deb -x "$deb" "$root"
+fi
+[ "$(readlink "$root/usr/bin/pocket-classifier")" = /opt/tarnex/exe/linux/pocket-classifier ] \
+  || fail "/usr/bin link not installed"
 HOME_FOR_RUN=$scratch/home
 make_zone "$scratch/zone" "$HOME_FOR_RUN"
 run_clean "$scratch/zone" "$root/opt/tarnex/exe/linux/pocket-classifier" R >"$scratch/run.out" \
@@ -38,4 +52,10 @@ cp -r "$source_dir/examples/zone" "$scratch/ref"
 (cd "$scratch/ref" && env -i PATH=/usr/bin:/bin TRXHOME="$source_dir/examples/installation" \
    TRXZONE="$scratch/ref" TRXTMPDIR="$scratch/ref/tmp" "$build/src/pocket-classifier" R >/dev/null)
 cmp "$scratch/zone/poches.res" "$scratch/ref/poches.res" || fail "unpacked program's poches.res differs"
+# Removing the package leaves nothing of it behind.
+if [ "$(id -u)" = 0 ]; then
+  "${dpkg_root[@]}" -r pocket-classifier >"$scratch/dpkg.log" 2>&1 || fail "dpkg -r: $(cat "$scratch/dpkg.log")"
+  left=$(cd "$root" && find opt usr -not -type d 2>/dev/null || true)
+  [ -z "$left" ] || fail "left after removal: $left"
+fi
 echo "deb_package: ok"
