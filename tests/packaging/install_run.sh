@@ -12,6 +12,9 @@ for f in exe/linux/pocket-classifier exe/linux/gen_contours config/environ.cfg \
          share/doc/pocket-classifier/examples/zone/tmp/outil.par; do
   [ -f "$prefix/$f" ] || fail "not installed: $f"
 done
+# An install into a prefix stays inside it (the /usr/bin link is the package's).
+outside=$(grep -v "^$prefix/" "$build/install_manifest.txt" || true)
+[ -z "$outside" ] || fail "installed outside the prefix: $outside"
 [ -x "$prefix/exe/linux/pocket-classifier" ] || fail "the installed program is not executable"
 if [ -x "$build/tools/pocket-inspect" ]; then
   [ -x "$prefix/exe/linux/pocket-inspect" ] || fail "pocket-inspect built but not installed"
