@@ -7,22 +7,11 @@
 #include <string_view>
 
 #include "env/configuration_loader.h"
-#include "env/diagnostic_channels.h"
 #include "env/message_table.h"
 #include "fuzz_support.h"
 
-namespace {
-
-void ignore(const char*) {}
-
-}  // namespace
-
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
-  pc::fuzz::quietConsole();
-  pc::platform::setEnv("TRXHOME", pc::fuzz::scratchDirectory());
-  // A fatal message ends nothing here: the loading gives up where it stands.
-  pc::setFatalHandler(ignore);
-  pc::setWarningHandler(ignore);
+  pc::fuzz::detachedDiagnostics();
   return 0;
 }
 

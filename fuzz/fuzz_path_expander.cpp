@@ -7,22 +7,11 @@
 #include <string>
 #include <string_view>
 
-#include "env/diagnostic_channels.h"
 #include "env/path_expander.h"
 #include "fuzz_support.h"
 
-namespace {
-
-void ignore(const char*) {}
-
-}  // namespace
-
 extern "C" int LLVMFuzzerInitialize(int*, char***) {
-  pc::fuzz::quietConsole();
-  pc::platform::setEnv("TRXHOME", pc::fuzz::scratchDirectory());
-  // A fatal message ends nothing here: the expansion gives up with its code.
-  pc::setFatalHandler(ignore);
-  pc::setWarningHandler(ignore);
+  pc::fuzz::detachedDiagnostics();
   return 0;
 }
 

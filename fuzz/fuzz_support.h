@@ -12,6 +12,7 @@
 #include <span>
 #include <string>
 
+#include "env/diagnostic_channels.h"
 #include "fileio/memory_files.h"
 #include "platform/platform.h"
 
@@ -56,6 +57,17 @@ inline void useAsFile(const std::string& name, const std::uint8_t* data, std::si
 // fuzzer down; the sanitizers report on standard error.
 inline void quietConsole() {
   if (std::freopen("/dev/null", "w", stdout) == nullptr) std::abort();
+}
+
+// Quiet console, the scratch directory as the installation, and fatal
+// messages and warnings that end nothing: the code under test then gives up
+// with its own return value, which is what the targets exercise.
+inline void ignoreDiagnostic(const char*) {}
+inline void detachedDiagnostics() {
+  quietConsole();
+  platform::setEnv("TRXHOME", scratchDirectory());
+  setFatalHandler(ignoreDiagnostic);
+  setWarningHandler(ignoreDiagnostic);
 }
 
 }  // namespace pc::fuzz
