@@ -38,9 +38,11 @@ function(pc_attach_version target)
   math(EXPR PCV_LOW "(${patch} << 16) | ${tweak}" OUTPUT_FORMAT HEXADECIMAL)
   set(version_text "${major}.${minor}.${patch}.${tweak}")
 
-  # The strings as one C literal of "name\0value\0" pairs; every piece is a
-  # literal of its own so that no "\0" runs into a following digit.
+  # The strings as one C literal of "name\0value\0" pairs (every piece a
+  # literal of its own so that no "\0" runs into a following digit), and as
+  # the VALUE lines of a Windows version resource.
   set(PCV_STRINGS "")
+  set(PCV_RC_STRINGS "")
   foreach(pair
       "FileDescription=${ARG_DESCRIPTION}"
       "FileVersion=${version_text}"
@@ -53,6 +55,9 @@ function(pc_attach_version target)
     math(EXPR start "${eq} + 1")
     string(SUBSTRING "${pair}" ${start} -1 value)
     string(REPLACE "\\" "\\\\" value "${value}")
+    # The resource compiler reads C escapes in strings and "" for a quote.
+    string(REPLACE "\"" "\"\"" rc_value "${value}")
+    string(APPEND PCV_RC_STRINGS "      VALUE \"${key}\", \"${rc_value}\"\n")
     string(REPLACE "\"" "\\\"" value "${value}")
     string(APPEND PCV_STRINGS " \"${key}\" \"\\0\" \"${value}\" \"\\0\"")
   endforeach()
@@ -61,23 +66,6 @@ function(pc_attach_version target)
   if(WIN32)
     # A real version resource, compiled by the resource compiler; the system
     # reads it back.
-    set(PCV_RC_STRINGS "")
-    foreach(pair
-        "FileDescription=${ARG_DESCRIPTION}"
-        "FileVersion=${version_text}"
-        "InternalName=${target}"
-        "OriginalFilename=${target}${CMAKE_EXECUTABLE_SUFFIX}"
-        "ProductName=${PROJECT_NAME}"
-        "ProductVersion=${version_text}")
-      string(FIND "${pair}" "=" eq)
-      string(SUBSTRING "${pair}" 0 ${eq} key)
-      math(EXPR start "${eq} + 1")
-      string(SUBSTRING "${pair}" ${start} -1 value)
-      # The resource compiler reads C escapes in strings and "" for a quote.
-      string(REPLACE "\\" "\\\\" value "${value}")
-      string(REPLACE "\"" "\"\"" value "${value}")
-      string(APPEND PCV_RC_STRINGS "      VALUE \"${key}\", \"${value}\"\n")
-    endforeach()
     set(PCV_COMMAS "${major},${minor},${patch},${tweak}")
     set(generated "${CMAKE_CURRENT_BINARY_DIR}/${target}_version.rc")
     file(CONFIGURE OUTPUT "${generated}" @ONLY CONTENT [=[
